@@ -53,7 +53,12 @@ void register_module() {
   record->methods = rows;
   record->method_count = globalMethodCount;
   record->interface_version = static_cast<std::uint32_t>(CurrentREALControlVersion);
-  REALRegisterModule(record);
+  if (!REALRegisterModule(record)) {
+    // No host took it: nothing was registered, and nothing is kept.
+    std::free(record->name);
+    std::free(rows);
+    std::free(record);
+  }
 }
 
 void register_each_method() {

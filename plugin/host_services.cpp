@@ -67,8 +67,11 @@ bool REALinRuntime() {
   return fn ? fn() : false;
 }
 
-void REALRegisterModule(ModuleRecord* record) {
-  if (auto fn = register_module_cache.as<host_sig::RegisterModule>()) fn(record);
+bool REALRegisterModule(ModuleRecord* record) {
+  auto fn = register_module_cache.as<host_sig::RegisterModule>();
+  if (!fn) return false;
+  fn(record);
+  return true;
 }
 
 void REALRegisterMethod(GlobalMethodEntry* row) {

@@ -59,7 +59,8 @@ class HostEntryCache {
 
 // Registration and start-up.
 bool REALinRuntime();
-void REALRegisterModule(ModuleRecord* record);
+// True when the host took the record (it owns it from then on).
+bool REALRegisterModule(ModuleRecord* record);
 void REALRegisterMethod(GlobalMethodEntry* row);
 
 // Strings.

@@ -1,0 +1,303 @@
+// The zul command line: option parsing, argument forms, overload choice and
+// result printing. Everything goes through one Host with the plug-in loaded,
+// so the ledger is checked after each call exactly as in the tests.
+#include "host/zul_cli.h"
+
+#include <cctype>
+#include <charconv>
+#include <cerrno>
+#include <cstdlib>
+#include <fstream>
+#include <iterator>
+#include <stdexcept>
+
+#include "host/text_convert.h"
+
+namespace zul_host {
+namespace {
+
+constexpr std::string_view kUsage =
+    "usage: zul [--plugin PATH] [--host-version V|none] [--verbose] list\n"
+    "       zul [--plugin PATH] [--host-version V|none] [--verbose] call NAME ARG...\n"
+    "string, memoryblock and ptr arguments: TEXT, hex:C3A9, file:PATH, @null,\n"
+    "  or utf8: utf16: utf32: latin1: cp1252: macroman: ascii: followed by TEXT\n";
+
+struct Prefix {
+  std::string_view prefix;
+  std::uint32_t encoding;
+};
+constexpr Prefix kPrefixes[] = {
+    {"utf8:", kUTF8},        {"utf16:", kUTF16},   {"utf32:", kUTF32}, {"latin1:", kLatin1},
+    {"cp1252:", kWindowsLatin1}, {"macroman:", kMacRoman}, {"ascii:", kASCII},
+};
+
+bool starts_with(std::string_view s, std::string_view p) { return s.substr(0, p.size()) == p; }
+
+std::optional<std::string> from_hex(std::string_view hex) {
+  if (hex.size() % 2) return std::nullopt;
+  std::string out;
+  for (std::size_t i = 0; i < hex.size(); i += 2) {
+    unsigned value = 0;
+    const auto [end, ec] = std::from_chars(hex.data() + i, hex.data() + i + 2, value, 16);
+    if (ec != std::errc() || end != hex.data() + i + 2) return std::nullopt;
+    out += static_cast<char>(value);
+  }
+  return out;
+}
+
+// Bytes and encoding for the string-like forms.
+std::optional<Str> parse_bytes(std::string_view text) {
+  if (text == "@null") return null_string();
+  if (starts_with(text, "hex:")) {
+    auto bytes = from_hex(text.substr(4));
+    if (!bytes) return std::nullopt;
+    return tagged(*bytes, kUnknown);
+  }
+  if (starts_with(text, "file:")) {
+    std::ifstream in(std::string(text.substr(5)), std::ios::binary);
+    if (!in) return std::nullopt;
+    return tagged(std::string((std::istreambuf_iterator<char>(in)), std::istreambuf_iterator<char>()), kUnknown);
+  }
+  for (const Prefix& p : kPrefixes) {
+    if (starts_with(text, p.prefix)) {
+      auto bytes = convert_text(text.substr(p.prefix.size()), kUTF8, p.encoding);
+      if (!bytes) return std::nullopt;
+      return tagged(*bytes, p.encoding);
+    }
+  }
+  return utf8(text);
+}
+
+bool printable_utf8(std::string_view s) {
+  for (std::size_t i = 0; i < s.size();) {
+    const auto c = static_cast<unsigned char>(s[i]);
+    if (c < 0x80) {
+      if ((c < 0x20 && c != '\t' && c != '\n' && c != '\r') || c == 0x7F) return false;
+      ++i;
+      continue;
+    }
+    const int n = c >= 0xC2 && c <= 0xDF ? 1 : c >= 0xE0 && c <= 0xEF ? 2 : c >= 0xF0 && c <= 0xF4 ? 3 : -1;
+    if (n < 0 || i + static_cast<std::size_t>(n) >= s.size()) return false;
+    std::uint32_t cp = c & (0x3F >> n);
+    for (int k = 1; k <= n; ++k) {
+      const auto t = static_cast<unsigned char>(s[i + k]);
+      if ((t & 0xC0) != 0x80) return false;
+      cp = (cp << 6) | (t & 0x3F);
+    }
+    const std::uint32_t min = n == 1 ? 0x80 : n == 2 ? 0x800 : 0x10000;
+    if (cp < min || cp > 0x10FFFF || (cp >= 0xD800 && cp <= 0xDFFF)) return false;
+    i += static_cast<std::size_t>(n) + 1;
+  }
+  return true;
+}
+
+std::string to_hex(std::string_view bytes) {
+  static constexpr char kDigits[] = "0123456789ABCDEF";
+  std::string out;
+  for (unsigned char c : bytes) {
+    out += kDigits[c >> 4];
+    out += kDigits[c & 15];
+  }
+  return out;
+}
+
+std::string format_bytes(std::string_view bytes, std::uint32_t encoding, bool* as_hex) {
+  if (encoding != kUnknown && encoding != kUTF8) {
+    if (auto text = convert_text(bytes, encoding, kUTF8); text && printable_utf8(*text)) {
+      if (as_hex) *as_hex = false;
+      return *text;
+    }
+  } else if (printable_utf8(bytes)) {
+    if (as_hex) *as_hex = false;
+    return std::string(bytes);
+  }
+  if (as_hex) *as_hex = true;
+  return to_hex(bytes);
+}
+
+}  // namespace
+
+std::optional<DynamicValue> parse_argument(ValueType type, std::string_view text) {
+  DynamicValue v;
+  v.type = type;
+  switch (type) {
+    case ValueType::string: {
+      auto s = parse_bytes(text);
+      if (!s) return std::nullopt;
+      v.string = *s;
+      return v;
+    }
+    case ValueType::memory_block:
+    case ValueType::ptr: {
+      auto s = parse_bytes(text);
+      if (!s) return std::nullopt;
+      v.block = {s->bytes, s->null};
+      return v;
+    }
+    case ValueType::integer: {
+      const char* end = text.data() + text.size();
+      const char* begin = text.data() + (starts_with(text, "+") ? 1 : 0);
+      const auto [at, ec] = std::from_chars(begin, end, v.integer);
+      if (text.empty() || ec != std::errc() || at != end) return std::nullopt;
+      return v;
+    }
+    case ValueType::double_: {
+      const std::string copy(text);
+      char* end = nullptr;
+      errno = 0;
+      v.real = std::strtod(copy.c_str(), &end);
+      if (copy.empty() || std::isspace(static_cast<unsigned char>(copy[0])) || *end != '\0') return std::nullopt;
+      return v;
+    }
+    case ValueType::boolean: {
+      std::string l(text);
+      for (char& c : l) c = static_cast<char>(std::tolower(static_cast<unsigned char>(c)));
+      if (l == "true" || l == "1") v.boolean = true;
+      else if (l == "false" || l == "0") v.boolean = false;
+      else return std::nullopt;
+      return v;
+    }
+    default:
+      return std::nullopt;
+  }
+}
+
+std::optional<std::string> choose_overload(const Registration& registration, std::string_view name,
+                                           const std::vector<std::string>& args,
+                                           std::vector<DynamicValue>& values) {
+  for (const RegisteredMethod& m : registration.methods) {
+    const auto d = parse_declaration(m.declaration);
+    if (!d || d->name != name || d->params.size() != args.size()) continue;
+    std::vector<DynamicValue> parsed;
+    for (std::size_t i = 0; i < args.size(); ++i) {
+      auto v = parse_argument(d->params[i].type, args[i]);
+      if (!v) break;
+      parsed.push_back(std::move(*v));
+    }
+    if (parsed.size() == args.size()) {
+      values = std::move(parsed);
+      return m.declaration;
+    }
+  }
+  return std::nullopt;
+}
+
+std::string format_value(const DynamicValue& value, bool* as_hex) {
+  if (as_hex) *as_hex = false;
+  switch (value.type) {
+    case ValueType::string: return format_bytes(value.string.bytes, value.string.encoding, as_hex);
+    case ValueType::memory_block:
+    case ValueType::ptr: return format_bytes(value.block.bytes, kUnknown, as_hex);
+    case ValueType::integer: return std::to_string(value.integer);
+    case ValueType::double_: {
+      char text[64];
+      const auto [end, ec] = std::to_chars(text, text + sizeof text, value.real);
+      return ec == std::errc() ? std::string(text, end) : "nan";
+    }
+    case ValueType::boolean: return value.boolean ? "true" : "false";
+    case ValueType::string_array: {
+      std::string out;
+      for (const Str& item : value.array.items) {
+        if (!out.empty()) out += '\n';
+        out += format_bytes(item.bytes, item.encoding, nullptr);
+      }
+      return out;
+    }
+    case ValueType::none: return "";
+  }
+  return "";
+}
+
+int run_zul(const std::vector<std::string>& args, const std::string& default_plugin, std::ostream& out,
+            std::ostream& err) {
+  std::string plugin = default_plugin;
+  HostConfig config;
+  bool verbose = false;
+  std::size_t i = 0;
+  for (; i < args.size() && starts_with(args[i], "--"); ++i) {
+    const std::string& option = args[i];
+    if (option == "--verbose") {
+      verbose = true;
+    } else if (option == "--plugin" && i + 1 < args.size()) {
+      plugin = args[++i];
+    } else if (option == "--host-version" && i + 1 < args.size()) {
+      const std::string& v = args[++i];
+      if (v == "none") {
+        config.version.reset();
+      } else if (auto parsed = parse_argument(ValueType::double_, v)) {
+        config.version = parsed->real;
+      } else {
+        err << "zul: --host-version wants a number or none, not '" << v << "'\n" << kUsage;
+        return 2;
+      }
+    } else {
+      err << "zul: unknown or incomplete option '" << option << "'\n" << kUsage;
+      return 2;
+    }
+  }
+  if (i >= args.size() || (args[i] != "list" && args[i] != "call") || (args[i] == "call" && i + 1 >= args.size())) {
+    err << kUsage;
+    return 2;
+  }
+
+  Host host(config);
+  try {
+    host.load(plugin);
+  } catch (const std::exception& e) {
+    err << "zul: " << e.what() << "\n";
+    return 3;
+  }
+  const Registration& registration = host.registration();
+  if (args[i] == "list") {
+    for (const RegisteredMethod& m : registration.methods) out << m.declaration << "\n";
+    return 0;
+  }
+
+  const std::string& name = args[i + 1];
+  const std::vector<std::string> call_args(args.begin() + static_cast<std::ptrdiff_t>(i) + 2, args.end());
+  std::vector<DynamicValue> values;
+  const auto declaration = choose_overload(registration, name, call_args, values);
+  if (!declaration) {
+    std::vector<std::string> candidates;
+    for (const RegisteredMethod& m : registration.methods) {
+      const auto d = parse_declaration(m.declaration);
+      if (d && d->name == name) candidates.push_back(m.declaration);
+    }
+    if (candidates.empty()) {
+      err << "zul: no function named " << name << " (see zul list)\n";
+    } else {
+      err << "zul: these arguments fit no overload of " << name << ":\n";
+      for (const std::string& c : candidates) err << "  " << c << "\n";
+    }
+    return 2;
+  }
+
+  DynamicValue result;
+  try {
+    result = call_dynamic(host, *declaration, values);
+  } catch (const std::exception& e) {
+    err << "zul: " << e.what() << "\n";
+    return 2;
+  }
+  if (verbose) err << "zul: called " << *declaration << "\n";
+  if (const auto& raised = host.last_exception()) {
+    err << raised->class_name << ": " << raised->message << "\n";
+    return 1;
+  }
+  bool as_hex = false;
+  out << format_value(result, &as_hex) << "\n";
+  const bool has_encoding = result.type == ValueType::string && !result.string.null;
+  if (has_encoding && (verbose || as_hex)) {
+    err << "zul: " << (as_hex ? "hex of a string in " : "string in ") << encoding_label(result.string.encoding)
+        << "\n";
+  } else if (result.type == ValueType::string && result.string.null && verbose) {
+    err << "zul: the null string\n";
+  }
+  if (!host.last_ledger_report().empty()) {
+    err << "zul: the host's ledger is not balanced after the call:\n" << host.last_ledger_report();
+    return 3;
+  }
+  return 0;
+}
+
+}  // namespace zul_host

@@ -1,0 +1,89 @@
+// Byte search: the rules on small tables, then the table-driven versions
+// against the plain reference on random data, sets and ranges.
+#include "search/byte_search.h"
+
+#include <gtest/gtest.h>
+
+#include <random>
+#include <string_view>
+#include <vector>
+
+namespace zul::search {
+namespace {
+
+bytes_view b(std::string_view s) { return {reinterpret_cast<const std::uint8_t*>(s.data()), s.size()}; }
+
+TEST(find_first_of, first_target_byte_in_the_set_wins) {
+  struct {
+    std::string_view target, set;
+    std::int64_t want;
+    const char* why;
+  } rows[] = {
+      {"hello world", "ow", 5, "first of any, not a substring search"},
+      {"abc", "xc", 3, "last byte"},
+      {"abc", "cba", 1, "the target order decides, not the set order"},
+      {"abc", "", 0, "empty set matches nothing"},
+      {"", "abc", 0, "empty target"},
+      {"abc", "x", 0, "no match, one-byte set"},
+      {std::string_view("a\0b", 3), std::string_view("\0", 1), 2, "NUL is an ordinary byte"},
+      {"\xC3\xA9", "\xA9", 2, "bytes, not characters"},
+  };
+  for (const auto& row : rows) {
+    SCOPED_TRACE(row.why);
+    EXPECT_EQ(find_first_of(b(row.target), b(row.set)), row.want);
+    EXPECT_EQ(detail::find_first_of_scalar(b(row.target), b(row.set)), row.want);
+  }
+}
+
+TEST(find_in_ranges, unsigned_and_signed_byte_values) {
+  const std::string_view c3 = "\xC3x";
+  struct {
+    std::string_view target;
+    byte_range range;
+    std::int64_t want_unsigned, want_signed;
+    const char* why;
+  } rows[] = {
+      {"ab7c1", {48, 57}, 3, 3, "first ASCII digit"},
+      {"ab7c1", {57, 48}, 0, 0, "reversed range is empty"},
+      {c3, {128, 255}, 1, 0, "0xC3 is 195 unsigned, -61 signed"},
+      {c3, {-128, -1}, 0, 1, "negative range only matches signed"},
+      {std::string_view("a\0", 2), {0, 0}, 2, 2, "range 0..0 finds NUL"},
+      {"abc", {-1000, 1000}, 1, 1, "bounds beyond a byte are not clamped"},
+  };
+  for (const auto& row : rows) {
+    SCOPED_TRACE(row.why);
+    const byte_range ranges[] = {row.range};
+    EXPECT_EQ(find_in_ranges(b(row.target), ranges), row.want_unsigned);
+    EXPECT_EQ(find_in_signed_ranges_or_set(b(row.target), ranges, {}), row.want_signed);
+  }
+}
+
+TEST(find_in_signed_ranges_or_set, set_byte_outside_every_range_matches) {
+  const byte_range digits[] = {{48, 57}};
+  EXPECT_EQ(find_in_signed_ranges_or_set(b("a-b"), digits, b("-")), 2);
+  EXPECT_EQ(find_in_signed_ranges_or_set(b("a-b9"), digits, b("")), 4);
+}
+
+TEST(byte_search, table_driven_versions_match_the_reference) {
+  std::mt19937 rng(12345);
+  auto random_bytes = [&](std::size_t n, int lo, int hi) {
+    std::uniform_int_distribution<int> d(lo, hi);
+    std::vector<std::uint8_t> v(n);
+    for (auto& x : v) x = static_cast<std::uint8_t>(d(rng));
+    return v;
+  };
+  std::uniform_int_distribution<int> len(0, 300), set_len(0, 6), bound(-300, 300);
+  for (int round = 0; round < 3000; ++round) {
+    const auto target = random_bytes(len(rng), round % 2 ? 0 : 100, 255);
+    const auto set = random_bytes(set_len(rng), 0, 255);
+    std::vector<byte_range> ranges;
+    for (int i = 0, n = 1 + round % 3; i < n; ++i) ranges.push_back({bound(rng), bound(rng)});
+    ASSERT_EQ(find_first_of(target, set), detail::find_first_of_scalar(target, set));
+    ASSERT_EQ(find_in_ranges(target, ranges), detail::find_in_ranges_scalar(target, ranges));
+    ASSERT_EQ(find_in_signed_ranges_or_set(target, ranges, set),
+              detail::find_in_signed_ranges_or_set_scalar(target, ranges, set));
+  }
+}
+
+}  // namespace
+}  // namespace zul::search

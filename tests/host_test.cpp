@@ -1,0 +1,282 @@
+// The stand-in host itself: its ledger must notice leaks, double releases,
+// undisposed or twice-disposed records and stale handles; its text
+// conversions must be right for all eight encodings; its services must
+// behave as the plug-in expects; and its declaration parser must read every
+// declaration the library registers. Driven through a small fake plug-in and
+// through the resolver directly.
+#include <gtest/gtest.h>
+
+#include <cstring>
+#include <thread>
+
+#include "host/host.h"
+#include "host/text_convert.h"
+#include "tests/declarations.h"
+
+namespace {
+
+using namespace zul_host;
+
+template <class Fn>
+Fn service(const Host& host, const char* name) {
+  auto fn = reinterpret_cast<Fn>(host.resolver()(name));
+  EXPECT_NE(fn, nullptr) << name;
+  return fn;
+}
+
+class FakeHost : public ::testing::Test {
+ protected:
+  FakeHost() { host_.load(ZUL_FAKE_PLUGIN_PATH); }
+  Host host_;
+};
+
+TEST_F(FakeHost, ledger_names_each_misuse) {
+  struct {
+    const char* declaration;
+    const char* want;
+    const char* why;
+  } rows[] = {
+      {"FakeLeakZUL(s as string) as integer", "string #", "a string made and never released"},
+      {"FakeLeakZUL(s as string) as integer", "made by REALBuildString", "the report names the maker"},
+      {"FakeDoubleUnlockZUL(s as string) as integer", "released once more than it was locked", "argument over-released"},
+      {"FakeKeepRecordZUL(s as string) as integer", "was never disposed", "record kept"},
+  };
+  for (const auto& row : rows) {
+    SCOPED_TRACE(row.why);
+    host_.call<std::int64_t>(row.declaration, utf8("abc"));
+    EXPECT_NE(host_.last_ledger_report().find(row.want), std::string::npos) << host_.last_ledger_report();
+  }
+  host_.call<Str>("FakeEchoZUL(s as string) as string", utf8("abc"));
+  EXPECT_EQ(host_.last_ledger_report(), "") << "a balanced call leaves the report empty";
+}
+
+TEST_F(FakeHost, dispose_twice_and_stale_handles_are_reported) {
+  host_.begin_ledger();
+  REALstring s = host_.make_string("x\xC3\xA9", kUTF8);
+  REALstringData record;
+  ASSERT_TRUE(service<host_sig::GetStringData>(host_, "PluginGetStringData")(s, kLatin1, &record));
+  EXPECT_EQ(record.length, 2u);
+  EXPECT_NE(static_cast<const unsigned char*>(record.data)[2], 0) << "no terminator after the bytes";
+  auto dispose = service<host_sig::DisposeStringData>(host_, "PluginDisposeStringData");
+  dispose(&record);
+  dispose(&record);
+  host_.release(s);
+  auto unlock = service<host_sig::LockString>(host_, "REALUnlockString");
+  unlock(s);  // already destroyed
+  const std::string report = host_.ledger_report();
+  EXPECT_NE(report.find("disposed twice"), std::string::npos) << report;
+  EXPECT_NE(report.find("used after it was destroyed, by REALUnlockString"), std::string::npos) << report;
+  EXPECT_EQ(host_.ref_count(s), 0);
+}
+
+TEST_F(FakeHost, every_type_crosses_the_call) {
+  const std::string byte("\x07", 1);
+  EXPECT_EQ(host_.call<double>("FakeSumZUL(a as integer, b as double, c as boolean, p as ptr, m as MemoryBlock) as double",
+                               std::int64_t{40}, 0.5, true, byte.data(), Block{"four", false}),
+            40 + 0.5 + 1 + 7 + 4);
+  EXPECT_EQ(host_.last_ledger_report(), "");
+  const StrArray parts = host_.call<StrArray>("FakeSplitZUL(s as string) as string()", utf8("zero"));
+  ASSERT_EQ(parts.items.size(), 3u);
+  EXPECT_EQ(parts.items[0], utf8("zero"));
+  EXPECT_EQ(parts.items[2], utf8("two"));
+  EXPECT_EQ(host_.last_ledger_report(), "");
+  EXPECT_EQ(host_.call<Block>("FakeBlockZUL(size as integer) as memoryblock", std::int64_t{3}).bytes, "zzz");
+  EXPECT_EQ(host_.last_ledger_report(), "");
+}
+
+TEST_F(FakeHost, raised_exception_is_taken_by_the_call) {
+  EXPECT_TRUE(host_.call<bool>("FakeRaiseZUL(message as string) as boolean", utf8("bad \xC3\xA9")));
+  ASSERT_TRUE(host_.last_exception().has_value());
+  EXPECT_EQ(*host_.last_exception(), (RaisedException{"RuntimeException", "bad \xC3\xA9", 42}));
+  EXPECT_EQ(host_.last_ledger_report(), "");
+  host_.call<Str>("FakeEchoZUL(s as string) as string", utf8("x"));
+  EXPECT_FALSE(host_.last_exception().has_value()) << "each call starts without one";
+}
+
+TEST_F(FakeHost, call_rejects_mismatched_types) {
+  EXPECT_THROW(host_.call<std::int64_t>("FakeEchoZUL(s as string) as string", utf8("x")), std::invalid_argument);
+  EXPECT_THROW(host_.call<Str>("FakeEchoZUL(s as string) as string", std::int64_t{1}), std::invalid_argument);
+  EXPECT_THROW(host_.call<Str>("NotThere(s as string) as string", utf8("x")), std::invalid_argument);
+}
+
+TEST(host_registration, both_paths_and_ownership) {
+  for (std::optional<double> version : {std::optional<double>{}, std::optional<double>{2019.0}}) {
+    HostConfig config;
+    config.version = version;
+    Host host(config);
+    host.load(ZUL_FAKE_PLUGIN_PATH);
+    const Registration& r = host.registration();
+    ASSERT_EQ(r.methods.size(), 8u);
+    EXPECT_EQ(r.methods[0].declaration, "FakeEchoZUL(s as string) as string");
+    EXPECT_EQ(r.module_calls, version ? 1 : 0);
+    EXPECT_EQ(r.method_calls, version ? 0 : 8);
+    EXPECT_EQ(r.module_name, version ? "FakeModule" : "");
+    EXPECT_EQ(*r.announced_version, version ? 13 : 9);
+    EXPECT_EQ(host.find("FakeEchoZUL(s as string) as string"), r.methods[0].function);
+  }
+}
+
+TEST(host_resolver, missing_and_late_services) {
+  HostConfig config;
+  config.missing = {"REALLockString"};
+  config.null_first = {"REALSetPropValueString"};
+  Host host(config);
+  REALResolver resolve = host.resolver();
+  EXPECT_EQ(resolve("REALLockString"), nullptr);
+  EXPECT_EQ(resolve("REALSetPropValueString"), nullptr);
+  EXPECT_NE(resolve("REALSetPropValueString"), nullptr);
+  EXPECT_EQ(resolve("NoSuchService"), nullptr);
+  EXPECT_EQ(host.lookups("REALSetPropValueString"), 2);
+  auto load = service<host_sig::LoadGlobalMethod>(host, "REALLoadGlobalMethod");
+  EXPECT_NE(load(nullptr, "LenB( s as string ) as integer"), nullptr);
+  EXPECT_EQ(load(nullptr, "LenB(s as string) as integer"), nullptr) << "the exact declaration only";
+}
+
+TEST(host_services, memory_blocks_and_cap) {
+  HostConfig config;
+  config.block_cap = 100;
+  Host host(config);
+  host.begin_ledger();
+  auto new_block = service<host_sig::NewMemoryBlock>(host, "newMemoryBlock");
+  EXPECT_EQ(new_block(101), nullptr);
+  auto new_instance = service<host_sig::NewInstance>(host, "PluginNewInstance");
+  auto load_method = service<host_sig::LoadObjectMethod>(host, "REALLoadObjectMethod");
+  auto handler = service<host_sig::CallWithExceptionHandler>(host, "PluginCallFunctionWithExceptionHandler");
+  auto get_int = service<host_sig::GetPropValueInteger>(host, "REALGetPropValueInteger");
+  auto unlock = service<host_sig::LockObject>(host, "REALUnlockObject");
+  for (std::int64_t size : {std::int64_t{10}, std::int64_t{1000}}) {
+    SCOPED_TRACE(size);
+    REALobject block = new_instance("MemoryBlock");
+    auto constructor =
+        reinterpret_cast<host_sig::MemoryBlockConstructor>(load_method(block, "Constructor(bytes as Integer)"));
+    struct Args {
+      host_sig::MemoryBlockConstructor constructor;
+      REALobject block;
+      std::int64_t size;
+    } args{constructor, block, size};
+    REALobject raised = handler([](void* p) {
+      auto* a = static_cast<Args*>(p);
+      a->constructor(a->block, a->size);
+    }, &args);
+    std::int64_t got = -1;
+    EXPECT_TRUE(get_int(block, "Size", &got));
+    EXPECT_EQ(got, size > 100 ? 0 : size);
+    EXPECT_EQ(raised != nullptr, size > 100);
+    if (raised) {
+      EXPECT_EQ(host.read_exception(raised)->class_name, "OutOfMemoryException");
+      unlock(raised);
+    }
+    unlock(block);
+  }
+  EXPECT_FALSE(host.take_pending_exception().has_value()) << "the handler cleared it";
+  EXPECT_EQ(host.ledger_report(), "");
+}
+
+TEST(host_services, unknown_classes_and_exception_names) {
+  HostConfig config;
+  config.unknown_classes = {"OutOfBoundsException"};
+  Host host(config);
+  auto new_instance = service<host_sig::NewInstance>(host, "PluginNewInstance");
+  EXPECT_EQ(new_instance("OutOfBoundsException"), nullptr);
+  EXPECT_EQ(new_instance("Dictionary"), nullptr);
+  for (const char* name : {"OutOfMemoryException", "IllegalCastException", "NilObjectException"}) {
+    REALobject e = new_instance(name);
+    ASSERT_NE(e, nullptr) << name;
+    host.release(e);
+  }
+}
+
+TEST(text_convert, round_trips_across_the_eight_encodings) {
+  const std::string text = "A\xC3\xA9\xE2\x82\xAC";  // "Aé€": in every encoding but Latin 1 and ASCII
+  const std::uint32_t all[] = {kMacRoman, kUTF16, kWindowsLatin1, kUTF8, kUTF32};
+  for (std::uint32_t e : all) {
+    SCOPED_TRACE(encoding_label(e));
+    const auto there = convert_text(text, kUTF8, e);
+    ASSERT_TRUE(there.has_value());
+    EXPECT_EQ(convert_text(*there, e, kUTF8), text);
+  }
+  struct {
+    std::string bytes;
+    std::uint32_t from;
+    std::optional<std::string> want_utf8;
+    const char* why;
+  } rows[] = {
+      {"\xE9", kMacRoman, "\xC3\x88", "Mac OS Roman 0xE9 is U+00C8"},
+      {"\x80", kWindowsLatin1, "\xE2\x82\xAC", "Windows-1252 0x80 is the euro sign"},
+      {"\x81", kWindowsLatin1, std::nullopt, "Windows-1252 0x81 is unassigned"},
+      {"\xE9", kLatin1, "\xC3\xA9", "ISO Latin 1"},
+      {"\xE9", kUnknown, "\xC3\xA9", "no declared encoding reads as Latin 1"},
+      {"\xE9", kASCII, std::nullopt, "not ASCII"},
+      {std::string("\xFF\xFE\x41\x00", 4), kUTF16, "\xEF\xBB\xBF" "A", "a byte-order mark is kept as a character"},
+      {std::string("\x3D\xD8\x00\xDE", 4), kUTF16, "\xF0\x9F\x98\x80", "surrogate pair"},
+      {std::string("\x00\xDE", 2), kUTF16, std::nullopt, "lone low surrogate"},
+      {"\xC3", kUTF8, "\xC3", "same encoding is a plain copy"},
+      {"abc", 0x1234, std::nullopt, "unknown encoding number"},
+  };
+  for (const auto& row : rows) {
+    SCOPED_TRACE(row.why);
+    EXPECT_EQ(convert_text(row.bytes, row.from, kUTF8), row.want_utf8);
+  }
+  EXPECT_EQ(convert_text("\xC3\xA9", kUTF8, kUTF32), std::string("\xE9\0\0\0", 4));
+  EXPECT_EQ(convert_text("\xE2\x82\xAC", kUTF8, kLatin1), std::nullopt);
+}
+
+TEST(text_convert, every_latin1_byte_round_trips_through_utf16_and_utf32) {
+  for (int b = 0; b < 256; ++b) {
+    const std::string byte(1, static_cast<char>(b));
+    for (std::uint32_t wide : {kUTF16, kUTF32}) {
+      const auto there = convert_text(byte, kLatin1, wide);
+      ASSERT_TRUE(there.has_value()) << b;
+      EXPECT_EQ(convert_text(*there, wide, kLatin1), byte) << b;
+    }
+  }
+}
+
+TEST(parse_declaration, every_registered_form) {
+  for (const char* d : kDeclarations) {
+    const auto parsed = parse_declaration(d);
+    ASSERT_TRUE(parsed.has_value()) << d;
+    EXPECT_NE(parsed->result, ValueType::none) << d;
+  }
+  struct {
+    std::string_view text;
+    std::optional<Declaration> want;
+    const char* why;
+  } rows[] = {
+      {"GetStringsFromDataZUL(data as ptr, size as Integer, MinLength as Integer = 0) as string()",
+       Declaration{"GetStringsFromDataZUL",
+                   {{"data", ValueType::ptr, {}}, {"size", ValueType::integer, {}}, {"MinLength", ValueType::integer, "0"}},
+                   ValueType::string_array},
+       "array result, default value"},
+      {"_yDecodeMemoryZUL(data as memoryblock) as memoryblock",
+       Declaration{"_yDecodeMemoryZUL", {{"data", ValueType::memory_block, {}}}, ValueType::memory_block},
+       "lower-case memoryblock"},
+      {"RandomBytesStringZUL(Length as integer, ASCII as boolean=false) as string",
+       Declaration{"RandomBytesStringZUL", {{"Length", ValueType::integer, {}}, {"ASCII", ValueType::boolean, "false"}},
+                   ValueType::string},
+       "no blanks around ="},
+      {"StringANDZUL(a as string,b as string) as string",
+       Declaration{"StringANDZUL", {{"a", ValueType::string, {}}, {"b", ValueType::string, {}}}, ValueType::string},
+       "no blank after the comma"},
+      {"ScientificStrZUL(d as double, digits as integer) as string",
+       Declaration{"ScientificStrZUL", {{"d", ValueType::double_, {}}, {"digits", ValueType::integer, {}}}, ValueType::string},
+       "double"},
+      {"LenB( s as string ) as integer",
+       Declaration{"LenB", {{"s", ValueType::string, {}}}, ValueType::integer}, "blanks inside the parentheses"},
+      {"Operator_Convert() As Ptr", Declaration{"Operator_Convert", {}, ValueType::ptr}, "no parameters, As"},
+      {"Constructor(bytes as Integer)", Declaration{"Constructor", {{"bytes", ValueType::integer, {}}}, ValueType::none},
+       "no result"},
+      {"F(a as string()) as string", std::nullopt, "array parameter"},
+      {"F(a string) as string", std::nullopt, "missing as"},
+      {"F(a as text) as string", std::nullopt, "unknown type"},
+      {"F(a as string", std::nullopt, "unclosed"},
+      {"(a as string) as string", std::nullopt, "no name"},
+      {"F(a as string) string", std::nullopt, "result without as"},
+  };
+  for (const auto& row : rows) {
+    SCOPED_TRACE(row.why);
+    EXPECT_EQ(parse_declaration(row.text), row.want);
+  }
+}
+
+}  // namespace

@@ -1,0 +1,172 @@
+// The zul tool: how it reads each argument form, which overload it picks,
+// how it prints results, and its exit statuses, run in process against the
+// fake plug-in and once as the built program.
+#include <gtest/gtest.h>
+
+#include <cstdio>
+#include <sstream>
+
+#include "host/zul_cli.h"
+
+namespace {
+
+using namespace zul_host;
+
+TEST(parse_argument, forms_by_type) {
+  struct {
+    ValueType type;
+    std::string_view text;
+    std::optional<Str> want;  // string view of the parsed value; nullopt: rejected
+    const char* why;
+  } rows[] = {
+      {ValueType::string, "héllo", utf8("héllo"), "plain text is UTF-8"},
+      {ValueType::string, "hex:C3a9", tagged("\xC3\xA9", kUnknown), "hex bytes, no declared encoding"},
+      {ValueType::string, "hex:C3A", std::nullopt, "odd hex digits"},
+      {ValueType::string, "hex:ZZ", std::nullopt, "not hex"},
+      {ValueType::string, "@null", null_string(), "the null string"},
+      {ValueType::string, "latin1:é", tagged("\xE9", kLatin1), "converted to Latin 1"},
+      {ValueType::string, "cp1252:€", tagged("\x80", kWindowsLatin1), "converted to Windows-1252"},
+      {ValueType::string, "macroman:È", tagged("\xE9", kMacRoman), "converted to Mac OS Roman"},
+      {ValueType::string, "utf16:A", tagged(std::string("A\0", 2), kUTF16), "UTF-16 host order"},
+      {ValueType::string, "utf32:A", tagged(std::string("A\0\0\0", 4), kUTF32), "UTF-32 host order"},
+      {ValueType::string, "ascii:é", std::nullopt, "does not convert to ASCII"},
+      {ValueType::string, "file:/no/such/file", std::nullopt, "unreadable file"},
+      {ValueType::string, "12", utf8("12"), "a string takes anything"},
+  };
+  for (const auto& row : rows) {
+    SCOPED_TRACE(row.why);
+    const auto got = parse_argument(row.type, row.text);
+    ASSERT_EQ(got.has_value(), row.want.has_value());
+    if (got) {
+      EXPECT_EQ(got->string, *row.want);
+    }
+  }
+  struct {
+    ValueType type;
+    std::string_view text;
+    bool ok;
+    double want;
+  } scalars[] = {
+      {ValueType::integer, "-42", true, -42}, {ValueType::integer, "+7", true, 7},
+      {ValueType::integer, "4.5", false, 0},  {ValueType::integer, "", false, 0},
+      {ValueType::integer, "12a", false, 0},  {ValueType::double_, "0.25", true, 0.25},
+      {ValueType::double_, "1e3", true, 1000}, {ValueType::double_, "x", false, 0},
+      {ValueType::boolean, "TRUE", true, 1},  {ValueType::boolean, "0", true, 0},
+      {ValueType::boolean, "yes", false, 0},
+  };
+  for (const auto& row : scalars) {
+    SCOPED_TRACE(row.text);
+    const auto got = parse_argument(row.type, row.text);
+    ASSERT_EQ(got.has_value(), row.ok);
+    if (!got) continue;
+    const double value = row.type == ValueType::integer ? static_cast<double>(got->integer)
+                         : row.type == ValueType::double_ ? got->real
+                                                          : (got->boolean ? 1.0 : 0.0);
+    EXPECT_EQ(value, row.want);
+  }
+  const auto block = parse_argument(ValueType::memory_block, "hex:0001");
+  ASSERT_TRUE(block.has_value());
+  EXPECT_EQ(block->block, (Block{std::string("\0\1", 2), false}));
+}
+
+TEST(format_value, text_hex_numbers_and_arrays) {
+  auto str = [](Str s) {
+    DynamicValue v;
+    v.type = ValueType::string;
+    v.string = std::move(s);
+    return v;
+  };
+  DynamicValue half;
+  half.type = ValueType::double_;
+  half.real = 0.5;
+  DynamicValue yes;
+  yes.type = ValueType::boolean;
+  yes.boolean = true;
+  DynamicValue list;
+  list.type = ValueType::string_array;
+  list.array.items = {utf8("a"), tagged("\xE9", kLatin1)};
+  struct {
+    DynamicValue value;
+    std::string want;
+    bool want_hex;
+    const char* why;
+  } rows[] = {
+      {str(utf8("caf\xC3\xA9")), "caf\xC3\xA9", false, "printable UTF-8"},
+      {str(tagged("\xE9", kLatin1)), "\xC3\xA9", false, "Latin 1 shown as text"},
+      {str(tagged("\x02\x03", kASCII)), "0203", true, "control bytes as hex"},
+      {str(tagged("\xC3", kUnknown)), "C3", true, "invalid UTF-8 as hex"},
+      {str(null_string()), "", false, "the null string"},
+      {half, "0.5", false, "shortest double"},
+      {yes, "true", false, "boolean"},
+      {list, "a\n\xC3\xA9", false, "one element a line"},
+  };
+  for (const auto& row : rows) {
+    SCOPED_TRACE(row.why);
+    bool hex = false;
+    EXPECT_EQ(format_value(row.value, &hex), row.want);
+    EXPECT_EQ(hex, row.want_hex);
+  }
+}
+
+struct ZulRun {
+  int status;
+  std::string out, err;
+};
+
+ZulRun zul(std::vector<std::string> args) {
+  std::ostringstream out, err;
+  const int status = run_zul(args, ZUL_FAKE_PLUGIN_PATH, out, err);
+  return {status, out.str(), err.str()};
+}
+
+TEST(run_zul, statuses_and_output) {
+  struct {
+    std::vector<std::string> args;
+    int want_status;
+    std::string want_out;
+    std::string want_err_part;
+    const char* why;
+  } rows[] = {
+      {{"call", "FakeEchoZUL", "hi"}, 0, "hi\n", "", "string result"},
+      {{"call", "FakeSumZUL", "1", "0.5", "true", "hex:02", "abc"}, 0, "7.5\n", "", "every argument type"},
+      {{"call", "FakeSumZUL", "1", "x", "true", "a", "b"}, 2, "", "fit no overload", "bad double"},
+      {{"call", "FakeSplitZUL", "@null"}, 0, "one\ntwo\n", "", "array"},
+      {{"call", "FakeBlockZUL", "2"}, 0, "zz\n", "", "memory block"},
+      {{"call", "FakeRaiseZUL", "boom"}, 1, "", "RuntimeException: boom", "raised exception"},
+      {{"call", "FakeLeakZUL", "x"}, 3, "1\n", "still has 1 reference", "unbalanced ledger"},
+      {{"call", "Missing", "x"}, 2, "", "no function named Missing", "unknown name"},
+      {{"call"}, 2, "", "usage", "no name"},
+      {{"frobnicate"}, 2, "", "usage", "unknown command"},
+      {{"--host-version", "soon", "list"}, 2, "", "--host-version", "bad version"},
+      {{"--plugin", "/no/such.so", "list"}, 3, "", "cannot read", "missing plug-in"},
+      {{"--host-version", "none", "call", "FakeEchoZUL", "hex:41"}, 0, "A\n", "", "per-method host"},
+  };
+  for (const auto& row : rows) {
+    SCOPED_TRACE(row.why);
+    const ZulRun run = zul(row.args);
+    EXPECT_EQ(run.status, row.want_status) << run.err;
+    if (row.want_status == 0 || row.want_status == 3) {
+      EXPECT_EQ(run.out, row.want_out);
+    }
+    EXPECT_NE(run.err.find(row.want_err_part), std::string::npos) << run.err;
+  }
+  const ZulRun list = zul({"list"});
+  EXPECT_EQ(list.out.substr(0, list.out.find('\n')), "FakeEchoZUL(s as string) as string");
+}
+
+TEST(zul_tool, runs_as_a_program) {
+  const std::string command = std::string(ZUL_TOOL_PATH) + " --plugin " + ZUL_FAKE_PLUGIN_PATH +
+                              " call FakeEchoZUL 'two words' 2>/dev/null";
+  FILE* pipe = popen(command.c_str(), "r");
+  ASSERT_NE(pipe, nullptr);
+  char buffer[64] = {};
+  const std::size_t n = fread(buffer, 1, sizeof buffer - 1, pipe);
+  const int status = pclose(pipe);
+  EXPECT_EQ(std::string(buffer, n), "two words\n");
+  EXPECT_EQ(WEXITSTATUS(status), 0);
+  FILE* bad = popen((std::string(ZUL_TOOL_PATH) + " call 2>/dev/null").c_str(), "r");
+  ASSERT_NE(bad, nullptr);
+  EXPECT_EQ(WEXITSTATUS(pclose(bad)), 2);
+}
+
+}  // namespace
