@@ -4,10 +4,13 @@
 #include <gtest/gtest.h>
 
 #include <cstring>
+#include <optional>
+#include <stdexcept>
 #include <string>
 #include <vector>
 
 #include "host/host.h"
+#include "plugin/exceptions.h"
 #include "plugin/host_services.h"
 #include "plugin/rb_data.h"
 #include "plugin/rb_text.h"
@@ -232,6 +235,48 @@ TEST_F(Frame, memory_block_copies_bytes) {
   host_.release(block);
   EXPECT_EQ(REALNewMemoryBlock(0, "x"), nullptr);
   EXPECT_EQ(REALNewMemoryBlock(-5, "x"), nullptr);
+}
+
+// A block of 2 GiB or more is made through the host class and its
+// constructor under the host's exception handler; the constructor's own
+// exception stays inside, and the library raises its own instead.
+TEST_F(Frame, huge_memory_block_failure_is_reported_once) {
+  EXPECT_EQ(REALNewMemoryBlock(std::int64_t{0x80000000}, nullptr), nullptr);
+  EXPECT_GE(host_.service_calls("PluginCallFunctionWithExceptionHandler"), 1);
+  const auto raised = host_.take_pending_exception();
+  ASSERT_TRUE(raised.has_value());
+  EXPECT_EQ(raised->class_name, "OutOfMemoryException");
+  EXPECT_EQ(raised->message, "Failed to allocate a memoryblock with 2147483648 bytes in size.");
+  EXPECT_FALSE(host_.take_pending_exception().has_value());
+}
+
+TEST_F(Frame, raise_exception_sets_class_message_and_number) {
+  struct {
+    const char* class_name;
+    const char* message;
+    zul_host::RaisedException want;
+    const char* why;
+  } rows[] = {
+      {"OutOfMemoryException", "Failed to allocate memory.",
+       {"OutOfMemoryException", "Failed to allocate memory.", 0}, "known class"},
+      {"OutOfBoundsException", "", {"OutOfBoundsException", "", 0}, "empty message"},
+      {"OutOfBoundsException", nullptr, {"OutOfBoundsException", "", 0}, "no message"},
+      {"NotAClass", "m\xC3\xA9", {"RuntimeException", "m\xC3\xA9", 0}, "unknown class falls back"},
+  };
+  for (const auto& row : rows) {
+    SCOPED_TRACE(row.why);
+    RaiseException(row.class_name, row.message, 0);
+    EXPECT_EQ(host_.take_pending_exception(), std::optional(row.want));
+  }
+}
+
+TEST_F(Frame, trap_raises_and_returns_the_empty_result) {
+  const int got = trapped(-1, []() -> int { throw std::out_of_range("index 9"); });
+  EXPECT_EQ(got, -1);
+  EXPECT_EQ(host_.take_pending_exception(),
+            std::optional(zul_host::RaisedException{"OutOfBoundsException", "index 9", 0}));
+  EXPECT_EQ(trapped(-1, [] { return 7; }), 7);
+  EXPECT_FALSE(host_.take_pending_exception().has_value());
 }
 
 }  // namespace
