@@ -1,0 +1,207 @@
+// HTML reference encoder and decoder over code points. Both reserve their
+// output once from the input length (4 bytes per character + 4 KiB; one code
+// point per character + 4 Ki) and make one pass. The encoder decides every
+// ASCII character from a 128-entry table per mode and looks characters from
+// U+0080 up in the entity index; the decoder copies runs without "&" whole.
+// The scalar versions scan the entity table row by row instead.
+#include "encodings/html.h"
+
+#include <array>
+#include <charconv>
+#include <string_view>
+
+#include "encodings/html_entities.h"
+
+namespace zul::encodings {
+namespace {
+
+bool is_byte_order_mark(std::uint32_t c) { return c == 0xFEFF || c == 0xFFFE; }
+
+code_point_view skip_byte_order_mark(code_point_view text) {
+  return !text.empty() && is_byte_order_mark(text[0]) ? text.subspan(1) : text;
+}
+
+// Controls other than tab, LF and CR are dropped from rewritten text.
+constexpr bool is_dropped_control(std::uint32_t c) { return c < 32 && c != 9 && c != 10 && c != 13; }
+
+constexpr bool is_markup(std::uint32_t c) { return c == '"' || c == '&' || c == '\'' || c == '<' || c == '>'; }
+
+void append_numeric_reference(std::string& out, std::uint32_t cp) {
+  char digits[10];
+  const auto end = std::to_chars(digits, digits + sizeof digits, cp).ptr;
+  out += "&#";
+  out.append(digits, end);
+  out += ';';
+}
+
+void append_named_reference(std::string& out, std::string_view name) {
+  out += '&';
+  out += name;
+  out += ';';
+}
+
+// What the encoder writes for each ASCII character in one mode; an empty
+// text drops the character.
+using ascii_actions = std::array<std::string_view, 128>;
+
+// Each ASCII character as a one-character text, for the tables below.
+constexpr std::array<char, 128> kAsciiChars = [] {
+  std::array<char, 128> chars{};
+  for (std::size_t c = 0; c < chars.size(); ++c) chars[c] = static_cast<char>(c);
+  return chars;
+}();
+
+constexpr ascii_actions make_ascii_actions(bool escape_markup) {
+  ascii_actions actions{};
+  for (std::uint32_t c = 0; c < 128; ++c) {
+    if (is_dropped_control(c)) continue;
+    actions[c] = std::string_view(&kAsciiChars[c], 1);
+  }
+  if (escape_markup) {
+    actions['"'] = "&quot;";
+    actions['&'] = "&amp;";
+    actions['\''] = "&#39;";
+    actions['<'] = "&lt;";
+    actions['>'] = "&gt;";
+  }
+  return actions;
+}
+
+constexpr ascii_actions kEscapeMarkup = make_ascii_actions(true);
+constexpr ascii_actions kKeepMarkup = make_ascii_actions(false);
+
+// The value of a reference name (the characters between "&" and ";"), or
+// nothing when the name is no reference. name_lookup maps an ASCII name to
+// its table code point.
+template <class NameLookup>
+std::optional<std::uint32_t> reference_value(code_point_view name, NameLookup name_lookup) {
+  char ascii[8];
+  bool all_ascii = true;
+  for (std::size_t k = 0; k < name.size(); ++k) {
+    if (name[k] > 127) all_ascii = false;
+    ascii[k] = static_cast<char>(name[k]);
+  }
+  if (all_ascii) {
+    if (auto cp = name_lookup(std::string_view(ascii, name.size()))) return cp;
+  }
+  if (name[0] != '#') return std::nullopt;
+  const bool hex = name.size() >= 2 && name[1] == 'x';
+  std::int64_t value = 0;
+  bool negative = false;
+  // At most 7 digits fit in a name, so the value cannot overflow.
+  for (std::size_t k = hex ? 2 : 1; k < name.size(); ++k) {
+    const std::uint32_t c = name[k];
+    if (c >= '0' && c <= '9') {
+      value = value * (hex ? 16 : 10) + (c - '0');
+    } else if (hex && c >= 'a' && c <= 'f') {
+      value = value * 16 + (c - 'a' + 10);
+    } else if (hex && c >= 'A' && c <= 'F') {
+      value = value * 16 + (c - 'A' + 10);
+    } else if (c == '-') {
+      negative = true;
+    } else {
+      break;
+    }
+  }
+  if (negative) value = -value;
+  if (value < 1) return std::nullopt;
+  return static_cast<std::uint32_t>(value);
+}
+
+template <class NameLookup>
+code_points decode_with(code_point_view text, NameLookup name_lookup) {
+  text = skip_byte_order_mark(text);
+  const std::size_t n = text.size();
+  code_points out;
+  out.reserve(n + 4096);
+  std::size_t i = 0;
+  while (i < n) {
+    std::size_t run = i;
+    while (run < n && text[run] != '&') ++run;
+    out.insert(out.end(), text.begin() + static_cast<std::ptrdiff_t>(i),
+               text.begin() + static_cast<std::ptrdiff_t>(run));
+    i = run;
+    if (i == n) break;
+    // text[i] is "&". Its name ends at ";" within 8 characters, or at the
+    // end of the text.
+    std::size_t length = 0;
+    bool bounded = false;
+    for (std::size_t k = 0; k <= 8; ++k) {
+      const std::size_t pos = i + 1 + k;
+      if (pos >= n || text[pos] == ';') {
+        length = k;
+        bounded = true;
+        break;
+      }
+    }
+    if (bounded && length > 0) {
+      if (auto cp = reference_value(text.subspan(i + 1, length), name_lookup)) {
+        out.push_back(*cp);
+        i += length + 2;
+        continue;
+      }
+    }
+    out.push_back('&');
+    ++i;
+  }
+  return out;
+}
+
+}  // namespace
+
+bool html_needs_escaping(code_point_view text) {
+  for (const std::uint32_t c : text) {
+    if (c > 127 || is_markup(c)) return true;
+  }
+  return false;
+}
+
+std::string encode_html(code_point_view text, std::int64_t options) {
+  text = skip_byte_order_mark(text);
+  const bool keep_markup = (options & 1) != 0;
+  const ascii_actions& actions = keep_markup ? kKeepMarkup : kEscapeMarkup;
+  std::string out;
+  out.reserve(4 * text.size() + 4096);
+  for (const std::uint32_t c : text) {
+    if (c < 128) {
+      out += actions[c];
+    } else if (const std::string_view name = entity_name(c, true); !name.empty()) {
+      append_named_reference(out, name);
+    } else {
+      append_numeric_reference(out, c);
+    }
+  }
+  return out;
+}
+
+code_points decode_html(code_point_view text) {
+  return decode_with(text, [](std::string_view name) { return entity_code_point(name); });
+}
+
+namespace detail {
+
+std::string encode_html_scalar(code_point_view text, std::int64_t options) {
+  text = skip_byte_order_mark(text);
+  const bool keep_markup = (options & 1) != 0;
+  std::string out;
+  out.reserve(4 * text.size() + 4096);
+  for (const std::uint32_t c : text) {
+    if (!keep_markup && c == '\'') {
+      out += "&#39;";
+    } else if (const std::string_view name = entity_name_scan(c, keep_markup); !name.empty()) {
+      append_named_reference(out, name);
+    } else if (c >= 128) {
+      append_numeric_reference(out, c);
+    } else if (!is_dropped_control(c)) {
+      out += static_cast<char>(c);
+    }
+  }
+  return out;
+}
+
+code_points decode_html_scalar(code_point_view text) {
+  return decode_with(text, [](std::string_view name) { return entity_code_point_scan(name); });
+}
+
+}  // namespace detail
+}  // namespace zul::encodings

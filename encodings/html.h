@@ -1,0 +1,47 @@
+// HTML character references over Unicode code points (UTF-32 text).
+// Encoding writes markup characters and every character from U+0080 up as
+// references (named where the HTML 4.01 table has a row, else "&#N;"),
+// producing ASCII. Decoding reads named, "&#N;" and "&#xH;" references
+// back; it never rejects input: anything that is not a reference, its "&"
+// included, is kept as text. Both drop a leading U+FEFF or U+FFFE.
+#pragma once
+
+#include <cstdint>
+#include <span>
+#include <string>
+#include <vector>
+
+namespace zul::encodings {
+
+using code_point_view = std::span<const std::uint32_t>;
+using code_points = std::vector<std::uint32_t>;
+
+// True when text holds a double quote, "&", an apostrophe, "<", ">" or a
+// character above U+007F anywhere in its whole length (a U+0000 does not
+// end the check). When false the caller keeps the text as it is.
+bool html_needs_escaping(code_point_view text);
+
+// Options: only bit 0 counts. Bit 0 clear: the apostrophe becomes "&#39;",
+// the double quote, "&", "<" and ">" their named references. Bit 0 set: the
+// five are copied as they are. In both modes characters below U+0020 other
+// than tab, LF and CR are dropped, other ASCII is copied, and characters
+// from U+0080 up become "&name;" or "&#N;" (decimal). Output is ASCII, at
+// most 11 bytes per character; empty text gives an empty result.
+std::string encode_html(code_point_view text, std::int64_t options);
+
+// Decodes references: "&" + name + ";" with a name of 1 to 8 characters (at
+// the very end of the text the ";" may be missing). A name of the table
+// gives its code point; "#" + decimal digits or "#x" + hex digits give their
+// value when it is 1 or more ("-" in the digits negates; characters after
+// the digits are ignored). Output is never longer than the input.
+code_points decode_html(code_point_view text);
+
+namespace detail {
+// The encoder with a row-by-row table scan for every character, as the
+// reference for the indexed version.
+std::string encode_html_scalar(code_point_view text, std::int64_t options);
+// The decoder with a row-by-row scan for each candidate name.
+code_points decode_html_scalar(code_point_view text);
+}  // namespace detail
+
+}  // namespace zul::encodings

@@ -1,0 +1,39 @@
+// Mail subject encoding: one pass with output reserved once (2 bytes per
+// input byte + 20, enough for mostly-ASCII subjects). Control bytes are
+// encoded too, since RFC 2047 allows no tab or control byte unencoded
+// inside an encoded word.
+#include "encodings/mail_subject.h"
+
+#include "encodings/hex_digits.h"
+
+namespace zul::encodings {
+
+bool subject_needs_encoding(std::string_view utf8) {
+  for (const char c : utf8) {
+    const auto b = static_cast<std::uint8_t>(c);
+    if (b < 32 || b > 127) return true;
+  }
+  return false;
+}
+
+std::string encode_mail_subject(std::string_view utf8) {
+  std::string out;
+  out.reserve(2 * utf8.size() + 20);
+  out += "=?utf-8?Q?";
+  for (const char c : utf8) {
+    const auto b = static_cast<std::uint8_t>(c);
+    if (b == ' ') {
+      out += '_';
+    } else if (b < 32 || b >= 127 || b == '=' || b == '?' || b == '_') {
+      out += '=';
+      out += kHexDigits[b >> 4];
+      out += kHexDigits[b & 15];
+    } else {
+      out += c;
+    }
+  }
+  out += "?=";
+  return out;
+}
+
+}  // namespace zul::encodings

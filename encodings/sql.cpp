@@ -1,0 +1,106 @@
+// SQL helpers: one pass each, output reserved once from the input length.
+// The boolean rewriter tracks two quote flags and the position in the
+// current word; a word byte is anything but a separator, quotes included.
+#include "encodings/sql.h"
+
+#include <array>
+#include <cstdint>
+#include <cstring>
+
+namespace zul::encodings {
+namespace {
+
+// The byte each MySQL escape letter stands for; 0xFFFF: no escape.
+constexpr std::array<std::uint16_t, 256> kMySQLEscapes = [] {
+  std::array<std::uint16_t, 256> table{};
+  for (auto& entry : table) entry = 0xFFFF;
+  table['0'] = 0;
+  table['\''] = '\'';
+  table['"'] = '"';
+  table['b'] = 8;
+  table['n'] = '\n';
+  table['r'] = '\r';
+  table['t'] = '\t';
+  table['Z'] = 26;
+  table['\\'] = '\\';
+  table['%'] = '%';
+  table['_'] = '_';
+  return table;
+}();
+
+constexpr std::array<bool, 256> kSeparators = [] {
+  std::array<bool, 256> table{};
+  for (unsigned b = 0; b < 256; ++b) table[b] = b <= 32 || b >= 128;
+  table['('] = table[')'] = table[','] = table[';'] = true;
+  return table;
+}();
+
+bool is_separator(char c) { return kSeparators[static_cast<std::uint8_t>(c)]; }
+
+// True when the bytes at p spell word (lower case) in any mixture of case.
+bool spells(const char* p, std::string_view word) {
+  for (std::size_t k = 0; k < word.size(); ++k) {
+    if ((p[k] | 0x20) != word[k]) return false;
+  }
+  return true;
+}
+
+}  // namespace
+
+std::string decode_mysql(std::string_view in) {
+  const std::size_t n = in.size();
+  std::string out;
+  out.reserve(n);
+  std::size_t i = 0;
+  while (i < n) {
+    const void* slash = std::memchr(in.data() + i, '\\', n - i);
+    const std::size_t at = slash ? static_cast<std::size_t>(static_cast<const char*>(slash) - in.data()) : n;
+    out.append(in.data() + i, at - i);
+    i = at;
+    if (i + 1 >= n) {  // no backslash, or a final one: kept as it is
+      out.append(in.data() + i, n - i);
+      break;
+    }
+    const std::uint16_t decoded = kMySQLEscapes[static_cast<std::uint8_t>(in[i + 1])];
+    if (decoded == 0xFFFF) {
+      out.append(in.data() + i, 2);
+    } else {
+      out += static_cast<char>(decoded);
+    }
+    i += 2;
+  }
+  return out;
+}
+
+std::string replace_sql_booleans(std::string_view utf8) {
+  const std::size_t n = utf8.size();
+  std::string out;
+  out.reserve(n + 10);
+  bool in_single = false;
+  bool in_double = false;
+  std::size_t word_position = 0;
+  for (std::size_t i = 0; i < n; ++i) {
+    const char c = utf8[i];
+    if (c == '\'' && !in_double) in_single = !in_single;
+    if (c == '"' && !in_single) in_double = !in_double;
+    word_position = is_separator(c) ? 0 : word_position + 1;
+    if (!in_single && !in_double && word_position == 1 && i + 5 < n) {
+      const char* p = utf8.data() + i;
+      if (spells(p, "false") && is_separator(p[5])) {
+        out += '0';
+        i += 4;
+        continue;
+      }
+      if (spells(p, "true") && is_separator(p[4])) {
+        out += '1';
+        i += 3;
+        continue;
+      }
+    }
+    out += c;
+  }
+  if (const std::size_t zero = out.find('\0'); zero != std::string::npos) out.resize(zero);
+  return out;
+}
+
+}  // namespace zul::encodings

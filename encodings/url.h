@@ -1,0 +1,35 @@
+// Percent-encoding of bytes for URLs and its inverse. Bytes are taken as
+// stored, whatever their text encoding. The unreserved set is this library's
+// own: letters, digits and "!*-.@_"; every other byte becomes "%" and two
+// upper-case hex digits (RFC 3986 section 2.1 notation). Space and "+" follow
+// the call's options only; nothing is shared between calls.
+#pragma once
+
+#include <cstdint>
+#include <string>
+#include <string_view>
+
+namespace zul::encodings {
+
+// Options bits (only options & 3 count):
+//   0: space -> "%20", "+" kept;   1: space -> "+", "+" -> "%2B";
+//   2: space -> "%20", "+" -> "%2B";  3: as 0.
+// The decoder turns "+" into a space when bit 0 is set.
+
+// Percent-encodes every byte of in. Output is at most 3 * size bytes.
+std::string encode_url(std::string_view in, std::int64_t options);
+
+// Decodes "%hh" sequences. Never rejects input: a non-hex digit counts as 0,
+// the two bytes after "%" are always consumed, and a "%" within the last two
+// bytes reads missing digits as 0 (nothing past the end is read). Output is
+// at most in.size() bytes.
+std::string decode_url(std::string_view in, std::int64_t options);
+
+namespace detail {
+// Byte-at-a-time versions that follow the rules directly; the table-driven
+// versions above must give the same output.
+std::string encode_url_scalar(std::string_view in, std::int64_t options);
+std::string decode_url_scalar(std::string_view in, std::int64_t options);
+}  // namespace detail
+
+}  // namespace zul::encodings

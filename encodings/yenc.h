@@ -1,0 +1,21 @@
+// yEnc decoding of the data bytes of an encoded part (header, trailer and
+// line breaks already removed by the caller). Every byte decodes: "=" takes
+// the next byte as escaped (minus 64), then every byte is reduced by 42,
+// modulo 256. CR and LF are data like any other byte.
+#pragma once
+
+#include <string>
+#include <string_view>
+
+namespace zul::encodings {
+
+// Decodes in. A final "=" decodes as if a zero byte followed it (0x96).
+// Output is never longer than the input.
+std::string decode_yenc(std::string_view in);
+
+namespace detail {
+// One byte at a time, as the reference for decode_yenc.
+std::string decode_yenc_scalar(std::string_view in);
+}  // namespace detail
+
+}  // namespace zul::encodings
