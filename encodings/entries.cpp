@@ -1,0 +1,201 @@
+// Host adapters for the web, mail and database encodings: each reads its
+// arguments (rbData for stored bytes, rbText for text in a known form),
+// calls the pure worker and builds the host result with its encoding.
+// Functions whose failures are reported run inside the shared trap; the
+// others give their empty result silently when a buffer cannot be had.
+// Nothing here keeps state between calls, so calls from several threads
+// are independent.
+#include <cstdint>
+#include <string>
+#include <vector>
+
+#include "encodings/html.h"
+#include "encodings/html_tags.h"
+#include "encodings/mail_subject.h"
+#include "encodings/quoted_printable.h"
+#include "encodings/sql.h"
+#include "encodings/url.h"
+#include "encodings/xml.h"
+#include "encodings/yenc.h"
+#include "plugin/exceptions.h"
+#include "plugin/host_services.h"
+#include "plugin/natives.h"
+#include "plugin/rb_data.h"
+#include "plugin/rb_text.h"
+#include "plugin/results.h"
+
+namespace enc = zul::encodings;
+using namespace text_encoding;
+
+namespace {
+
+// The input string itself as the result: the caller owns one more reference.
+REALstring same_string(REALstring s) {
+  REALLockString(s);
+  return s;
+}
+
+// For functions that report no failure: a buffer that cannot be allocated
+// gives the empty result and no host exception.
+template <class R, class Body>
+R quietly(R empty, Body&& body) noexcept {
+  try {
+    return body();
+  } catch (...) {
+    return empty;
+  }
+}
+
+REALstring build_utf32(const enc::code_points& text) {
+  return REALBuildUnicodeString(text.data(), static_cast<std::int64_t>(text.size() * 4), kUTF32);
+}
+
+}  // namespace
+
+// URL percent-encoding. Space and "+" follow this call's options only.
+REALstring EncodingToURL2(REALstring s, int64_t options) {
+  if (!s) return nullptr;
+  rbData in(s);
+  return quietly<REALstring>(nullptr, [&] { return build_string(enc::encode_url(in.view(), options), kASCII); });
+}
+
+REALstring EncodingToURL1(REALstring s) { return EncodingToURL2(s, 0); }
+
+REALstring DecodingToURL2(REALstring s, int64_t options) {
+  if (!s) return nullptr;
+  rbData in(s);
+  if (in.length < 1) return nullptr;
+  return quietly<REALstring>(nullptr, [&] { return build_string(enc::decode_url(in.view(), options), kUnknown); });
+}
+
+REALstring DecodingToURL1(REALstring s) { return DecodingToURL2(s, 0); }
+
+// HTML character references over the string's code points.
+REALstring EncodingToHTML(REALstring s, int64_t options) {
+  if (!s) return nullptr;
+  return trapped<REALstring>(nullptr, [&]() -> REALstring {
+    rbText text(s);
+    text.ConvertUTF32();
+    const auto chars = text.utf32();
+    if (chars.empty()) return nullptr;
+    if (!enc::html_needs_escaping(chars)) return same_string(s);
+    return build_string(enc::encode_html(chars, options), kASCII);
+  });
+}
+
+// Registered as both "DecodingFromHTMLZUL" and "DecodingFromXMLZUL".
+REALstring DecodingToHTML(REALstring s) {
+  if (!s) return nullptr;
+  return trapped<REALstring>(nullptr, [&]() -> REALstring {
+    rbText text(s);
+    text.ConvertUTF32();
+    const auto chars = text.utf32();
+    if (chars.empty()) return nullptr;
+    return build_utf32(enc::decode_html(chars));
+  });
+}
+
+REALstring EncodingToXML(REALstring s, int64_t options) {
+  if (!s) return nullptr;
+  return trapped<REALstring>(nullptr, [&]() -> REALstring {
+    rbText text(s);
+    text.ConvertUTF32();
+    const auto chars = text.utf32();
+    if (chars.empty()) return nullptr;
+    if (!enc::xml_needs_escaping(chars)) return same_string(s);
+    return build_utf32(enc::encode_xml(chars, options));
+  });
+}
+
+// Ready means: stored as ASCII-compatible text and holding only bytes 1..127
+// other than the five markup characters.
+static bool is_markup_ready(REALstring s) {
+  if (!s) return true;
+  bool available = false;
+  const std::uint32_t encoding = REALGetStringEncoding(s, &available);
+  if (available && encoding != kMacRoman && encoding != kWindowsLatin1 && encoding != kASCII &&
+      encoding != kUTF8) {
+    return false;
+  }
+  rbData in(s);
+  return enc::is_markup_free_ascii(in.view());
+}
+
+bool StringIsHTMLready(REALstring s) { return is_markup_ready(s); }
+bool StringIsXMLready(REALstring s) { return is_markup_ready(s); }
+
+// Quoted-printable over the stored bytes.
+REALstring EncodingToQuotedPrintable2(REALstring s, int64_t line_length) {
+  if (!s) return nullptr;
+  return trapped<REALstring>(nullptr, [&] {
+    rbData in(s);
+    return build_string(enc::encode_quoted_printable(in.view(), line_length), kASCII);
+  });
+}
+
+REALstring DecodingToQuotedPrintable(REALstring s) {
+  if (!s) return nullptr;
+  return trapped<REALstring>(nullptr, [&] {
+    rbData in(s);
+    return build_string(enc::decode_quoted_printable(in.view()), kASCII);
+  });
+}
+
+// A subject of printable ASCII (the empty one included) comes back as it is.
+REALstring EncodeEmailSubjectZUL(REALstring s) {
+  if (!s) return nullptr;
+  return trapped<REALstring>(nullptr, [&]() -> REALstring {
+    rbText text(s);
+    const std::string_view utf8 = text.utf8();
+    if (!enc::subject_needs_encoding(utf8)) return same_string(s);
+    return build_string(enc::encode_mail_subject(utf8), kASCII);
+  });
+}
+
+// yEnc data bytes.
+REALstring yDecodeZULs(REALstring data) {
+  if (!data) return nullptr;
+  rbData in(data);
+  if (in.length < 1) return nullptr;
+  return quietly<REALstring>(nullptr, [&] { return build_string(enc::decode_yenc(in.view()), kUnknown); });
+}
+
+REALmemoryBlock yDecodeZULm(REALmemoryBlock data) {
+  if (!data) return nullptr;
+  rbData in(data);
+  if (in.length < 1 || !in.data) return nullptr;
+  std::string decoded;
+  if (!quietly(false, [&] {
+        decoded = enc::decode_yenc(in.view());
+        return true;
+      })) {
+    return nullptr;
+  }
+  return REALNewMemoryBlock(static_cast<std::int64_t>(decoded.size()), decoded.data());
+}
+
+// Tag removal over the UTF-8 text; the replacement is read as UTF-8 too.
+REALstring RemoveHTMLTagsWith(REALstring s, REALstring replacement) {
+  if (!s) return nullptr;
+  return trapped<REALstring>(nullptr, [&] {
+    rbText text(s);
+    rbText with(replacement);
+    return build_string(enc::remove_html_tags(text.utf8(), with.utf8()), kUTF8);
+  });
+}
+
+REALstring RemoveHTMLTags(REALstring s) { return RemoveHTMLTagsWith(s, nullptr); }
+
+// SQL helpers.
+REALstring DecodingFromMySQL(REALstring s) {
+  if (!s) return nullptr;
+  rbData in(s);
+  if (in.length < 1) return nullptr;
+  return quietly<REALstring>(nullptr, [&] { return build_string(enc::decode_mysql(in.view()), kUnknown); });
+}
+
+REALstring SQLReplaceBooleanZUL(REALstring sql) {
+  if (!sql) return nullptr;
+  rbText text(sql);
+  return quietly<REALstring>(nullptr, [&] { return build_string(enc::replace_sql_booleans(text.utf8()), kUTF8); });
+}

@@ -1,0 +1,243 @@
+// Web, mail and database encodings end to end: each row calls a registered
+// declaration through the stand-in host (ledger checked after every call)
+// and checks the result's bytes and the encoding it carries.
+#include <optional>
+#include <string>
+#include <thread>
+#include <vector>
+
+#include "tests/host_fixture.h"
+
+namespace {
+
+using namespace std::string_view_literals;
+using zul_host::Block;
+using zul_host::null_string;
+using zul_host::Str;
+using zul_host::tagged;
+using zul_host::utf8;
+using namespace text_encoding;
+
+constexpr const char* kURL1 = "EncodingToURLZUL(s as string) as string";
+constexpr const char* kURL2 = "EncodingToURLZUL(s as string, options as integer) as string";
+constexpr const char* kUnURL1 = "DecodingFromURLZUL(s as string) as string";
+constexpr const char* kUnURL2 = "DecodingFromURLZUL(s as string, options as integer) as string";
+constexpr const char* kHTML = "EncodingToHTMLZUL(s as string, options as integer = 0) as string";
+constexpr const char* kUnHTML = "DecodingFromHTMLZUL(s as string) as string";
+constexpr const char* kXML = "EncodingToXMLZUL(s as string, options as integer = 0) as string";
+constexpr const char* kUnXML = "DecodingFromXMLZUL(s as string) as string";
+constexpr const char* kHTMLready = "StringIsHTMLreadyZUL(s as string) as boolean";
+constexpr const char* kXMLready = "StringIsXMLreadyZUL(s as string) as boolean";
+constexpr const char* kQP = "EncodingToQuotedPrintableZUL(s as string, LineLen as integer = 72) as string";
+constexpr const char* kUnQP = "DecodingFromQuotedPrintableZUL(s as string) as string";
+constexpr const char* kSubject = "EncodeEmailSubjectZUL(s as string) as string";
+constexpr const char* kYencS = "_yDecodeStringZUL(data as string) as string";
+constexpr const char* kYencM = "_yDecodeMemoryZUL(data as memoryblock) as memoryblock";
+constexpr const char* kTags = "RemoveHTMLTagsZUL(AsciiTextWithTags as string) as string";
+constexpr const char* kTagsWith =
+    "RemoveHTMLTagsWithZUL(AsciiTextWithTags as string, Replacement as string) as string";
+constexpr const char* kMySQL = "DecodingFromMySQLZUL(s as string) as string";
+constexpr const char* kBoolean = "SQLReplaceBooleanZUL(SQL as string) as string";
+
+// A wanted result: the null string, or bytes with an encoding.
+Str none() { return null_string(); }
+Str ascii(std::string_view bytes) { return tagged(bytes, kASCII); }
+Str unknown(std::string_view bytes) { return tagged(bytes, kUnknown); }
+
+testing::AssertionResult same(const Str& got, const Str& want) {
+  if (want.null && got.null) return testing::AssertionSuccess();
+  if (!want.null && !got.null && got.bytes == want.bytes && got.encoding == want.encoding) {
+    return testing::AssertionSuccess();
+  }
+  auto describe = [](const Str& s) {
+    return s.null ? std::string("null") : "\"" + s.bytes + "\" encoding " + std::to_string(s.encoding);
+  };
+  return testing::AssertionFailure() << "got " << describe(got) << ", want " << describe(want);
+}
+
+using Encodings = HostTest;
+
+// One call of a string function: with options when the declaration has them.
+struct call_row {
+  const char* declaration;
+  Str in;
+  std::optional<std::int64_t> options;
+  Str want;
+  const char* why;
+};
+
+const call_row kRows[] = {
+    {kURL2, utf8("a b+c"), 0, ascii("a%20b+c"), "url options 0"},
+    {kURL2, utf8("a b+c"), 1, ascii("a+b%2Bc"), "url options 1"},
+    {kURL2, utf8("a b+c"), 2, ascii("a%20b%2Bc"), "url options 2"},
+    {kURL2, utf8("a b+c"), 7, ascii("a%20b+c"), "url options 7 as 3"},
+    {kURL1, utf8("a b+c"), {}, ascii("a%20b+c"), "url without options"},
+    {kURL1, tagged("\xE9", kLatin1), {}, ascii("%E9"), "url bytes as stored"},
+    {kURL1, utf8(""), {}, none(), "url empty"},
+    {kURL2, null_string(), 1, none(), "url null"},
+    {kUnURL1, utf8("%41%4a"), {}, ascii("AJ"), "unurl ASCII result"},
+    {kUnURL1, utf8("%C3%A9"), {}, unknown("\xC3\xA9"), "unurl high bytes carry no encoding"},
+    {kUnURL1, utf8("100%"), {}, ascii("100\0"sv), "unurl % at the end"},
+    {kUnURL2, utf8("a+b"), 3, ascii("a b"), "unurl plus as space"},
+    {kUnURL2, utf8(""), 1, none(), "unurl empty"},
+    {kHTML, utf8("Tom & Jerry's <b>"), 0, ascii("Tom &amp; Jerry&#39;s &lt;b&gt;"), "html markup"},
+    {kHTML, utf8("Tom & Jerry's <b>"), 1, ascii("Tom & Jerry's <b>"), "html markup kept"},
+    {kHTML, tagged("caf\xE9", kLatin1), 1, ascii("caf&eacute;"), "html read as characters"},
+    {kHTML, tagged("\x3D\xD8\x00\xDE"sv, kUTF16), 0, ascii("&#128512;"), "html surrogate pair"},
+    {kHTML, utf8("a\0<"sv), 0, ascii("a&lt;"), "html: a zero does not end the check"},
+    {kHTML, tagged("a \x01 b", kWindowsLatin1), 0, tagged("a \x01 b", kWindowsLatin1), "html same string"},
+    {kHTML, utf8("\xEF\xBB\xBF"), 0, none(), "html byte-order mark only"},
+    {kHTML, utf8(""), 0, none(), "html empty"},
+    {kXML, utf8("it's"), 0, utf8("it&#39;s"), "xml apostrophe, options 0"},
+    {kXML, utf8("it's"), 3, utf8("it&apos;s"), "xml apostrophe, options 3"},
+    {kXML, tagged("\xE9 & \x07", kLatin1), 0, utf8("\xC3\xA9 &amp; "), "xml non-ASCII kept, control dropped"},
+    {kXML, utf8("\xE6\x97\xA5\x07"), 0, utf8("\xE6\x97\xA5\x07"), "xml same string"},
+    {kXML, null_string(), 1, none(), "xml null"},
+    {kUnHTML, utf8("&thetasym;&lt;&#x41;&#X41;"), {}, utf8("\xCF\x91<A&#X41;"), "unhtml"},
+    {kUnXML, utf8("&thetasym;&lt;&#x41;&#X41;"), {}, utf8("\xCF\x91<A&#X41;"), "unxml is unhtml"},
+    {kUnHTML, tagged("&eacute;\xE9 &amp", kLatin1), {}, utf8("\xC3\xA9\xC3\xA9 &"), "unhtml Latin-1"},
+    {kUnXML, utf8(""), {}, none(), "unxml empty"},
+    {kQP, utf8("Gr\xC3\xBC\xC3\x9F" "e=\t"), 72, ascii("Gr=C3=BC=C3=9Fe=3D\t"), "qp"},
+    {kQP, utf8("a \r\nb"), 0, ascii("a=20\r\nb=\r\n"), "qp space before a break"},
+    {kQP, utf8("ab"), 2, ascii("=\r\na=\r\nb"), "qp line length 2"},
+    {kQP, utf8(""), 72, none(), "qp empty"},
+    {kUnQP, utf8("=c3=a9= x\r\nb"), {}, ascii("\xC3\xA9" "b"), "unqp high bytes marked ASCII"},
+    {kUnQP, utf8("=4G"), {}, none(), "unqp nothing written"},
+    {kSubject, tagged("Hi =?_", kWindowsLatin1), {}, tagged("Hi =?_", kWindowsLatin1), "subject same string"},
+    {kSubject, tagged("Caf\xE9?", kLatin1), {}, ascii("=?utf-8?Q?Caf=C3=A9=3F?="), "subject as UTF-8"},
+    {kSubject, utf8("a b_c=d\t"), {}, ascii("=?utf-8?Q?a_b=5Fc=3Dd=09?="), "subject tab encoded"},
+    {kSubject, utf8("a\0b\x7F"sv), {}, ascii("=?utf-8?Q?a=00b=7F?="), "subject zero byte"},
+    {kSubject, null_string(), {}, none(), "subject null"},
+    {kYencS, utf8("rst*"), {}, ascii("HIJ\0"sv), "yenc ASCII result"},
+    {kYencS, utf8("=@=}a="), {}, unknown("\xD6\x13\x37\x96"), "yenc escapes and a final ="},
+    {kYencS, utf8(""), {}, none(), "yenc empty"},
+    {kTags, utf8("<b>bold</b> x<a<b>>y"), {}, utf8("bold xy"), "tags nested"},
+    {kTags, utf8("a>b<c<d"), {}, utf8("ac"), "tags unbalanced"},
+    {kTags, tagged("\xE9<i>\xFC</i>", kLatin1), {}, utf8("\xC3\xA9\xC3\xBC"), "tags Latin-1"},
+    {kTags, utf8("<p>\0"sv), {}, none(), "tags nothing left"},
+    {kMySQL, utf8("It\\'s \\\\n\\x\\Z\\"), {}, ascii("It's \\n\\x\x1A\\"), "mysql"},
+    {kMySQL, utf8("\xC3\xA9\\0"), {}, unknown("\xC3\xA9\0"sv), "mysql high bytes"},
+    {kMySQL, utf8(""), {}, none(), "mysql empty"},
+    {kBoolean, utf8("a = true AND b = FALSE ORDER BY c"), {}, utf8("a = 1 AND b = 0 ORDER BY c"), "sql"},
+    {kBoolean, utf8("a=true 'true' trueish x = TrUe;"), {}, utf8("a=true 'true' trueish x = TrUe;"), "sql kept"},
+    {kBoolean, tagged("(true, false) \xE9", kLatin1), {}, utf8("(1, 0) \xC3\xA9"), "sql Latin-1"},
+    {kBoolean, utf8("\0true x"sv), {}, none(), "sql cut at a zero byte"},
+};
+
+TEST_F(Encodings, string_functions) {
+  for (const auto& row : kRows) {
+    SCOPED_TRACE(row.why);
+    const Str got = row.options ? call<Str>(row.declaration, row.in, *row.options) : call<Str>(row.declaration, row.in);
+    EXPECT_TRUE(same(got, row.want));
+  }
+}
+
+TEST_F(Encodings, round_trips_of_every_byte_past_the_reserves) {
+  std::string all;
+  for (int round = 0; round < 300; ++round) {
+    for (int b = 0; b < 256; ++b) all += static_cast<char>(b);
+  }
+  for (const std::int64_t options : {0, 1, 2}) {
+    SCOPED_TRACE(options);
+    EXPECT_TRUE(same(call<Str>(kUnURL2, call<Str>(kURL2, tagged(all, kUnknown), options), options), unknown(all)));
+  }
+  std::string no_breaks;
+  for (const char c : all) {
+    if (c != '\r' && c != '\n') no_breaks += c;
+  }
+  EXPECT_TRUE(same(call<Str>(kUnQP, call<Str>(kQP, tagged(no_breaks, kUnknown), std::int64_t{76})), ascii(no_breaks)));
+  std::string text;
+  while (text.size() < 70000) text += "Tom & Jerry's <caf\xC3\xA9> \xE2\x82\xAC \xF0\x9F\x98\x80 ";
+  EXPECT_TRUE(same(call<Str>(kUnHTML, call<Str>(kHTML, utf8(text), std::int64_t{0})), utf8(text)));
+  EXPECT_TRUE(same(call<Str>(kUnXML, call<Str>(kXML, utf8(text), std::int64_t{1})), utf8(text)));
+}
+
+// Calls with different options at once never see each other's choice.
+TEST_F(Encodings, url_options_are_per_call_across_threads) {
+  std::vector<std::thread> threads;
+  std::vector<int> wrong(4, 0);
+  for (int t = 0; t < 4; ++t) {
+    threads.emplace_back([&, t] {
+      const std::int64_t options = t % 2;
+      const std::string want = options ? "a+b%2Bc" : "a%20b+c";
+      for (int i = 0; i < 200; ++i) {
+        if (host_.call<Str>(kURL2, utf8("a b+c"), options).bytes != want) ++wrong[t];
+      }
+    });
+  }
+  for (auto& thread : threads) thread.join();
+  EXPECT_EQ(wrong, std::vector<int>(4, 0));
+}
+
+TEST_F(Encodings, readiness) {
+  const struct {
+    Str in;
+    bool want;
+    const char* why;
+  } rows[] = {
+      {utf8("Hello"), true, "plain"},
+      {tagged("Hello", kMacRoman), true, "Mac OS Roman"},
+      {utf8("a&b"), false, "ampersand"},
+      {utf8("it's"), false, "apostrophe"},
+      {utf8("caf\xC3\xA9"), false, "byte above 127"},
+      {utf8("a\0b"sv), false, "zero byte"},
+      {tagged("Hello", kUTF16), false, "UTF-16 encoding"},
+      {tagged("Hello", kLatin1), false, "ISO Latin 1 encoding"},
+      {utf8(""), true, "empty"},
+      {null_string(), true, "null"},
+  };
+  for (const auto& row : rows) {
+    SCOPED_TRACE(row.why);
+    EXPECT_EQ(call<bool>(kHTMLready, row.in), row.want);
+    EXPECT_EQ(call<bool>(kXMLready, row.in), row.want);
+  }
+}
+
+TEST_F(Encodings, subject_of_an_empty_string_is_that_string) {
+  EXPECT_EQ(call<Str>(kSubject, utf8("")).bytes, "");
+}
+
+TEST_F(Encodings, yenc_memory_block_matches_the_string_variant) {
+  std::string all;
+  for (int b = 0; b < 256; ++b) all += static_cast<char>(b);
+  const Block from_block = call<Block>(kYencM, Block{all});
+  EXPECT_FALSE(from_block.null);
+  EXPECT_EQ(from_block.bytes, call<Str>(kYencS, tagged(all, kUnknown)).bytes);
+  EXPECT_EQ(from_block.bytes.size(), 255u);  // "=" takes the byte after it
+  EXPECT_TRUE(call<Block>(kYencM, Block{""}).null);
+}
+
+class SmallBlocks : public HostTest {
+ protected:
+  SmallBlocks() : HostTest([] {
+    zul_host::HostConfig config;
+    config.block_cap = 4;
+    return config;
+  }()) {}
+};
+
+TEST_F(SmallBlocks, yenc_memory_block_that_cannot_be_made) {
+  EXPECT_TRUE(call<Block>(kYencM, Block{"rstuvwxyz"}).null);
+  ASSERT_TRUE(raised().has_value());
+  EXPECT_EQ(raised()->class_name, "OutOfMemoryException");
+  EXPECT_EQ(raised()->message, "Failed to allocate a memoryblock with 9 bytes in size.");
+}
+
+TEST_F(Encodings, tags_with_a_replacement) {
+  const struct {
+    Str in, replacement, want;
+    const char* why;
+  } rows[] = {
+      {utf8("a<br>b"), utf8("-"), utf8("a--b"), "once per byte inside"},
+      {utf8("a<\xC3\xA9>b"), tagged("*", kASCII), utf8("a**b"), "UTF-8 bytes inside"},
+      {utf8("a<\xC3\xA9>b"), tagged("\xE9", kLatin1), utf8("a\xC3\xA9\xC3\xA9" "b"), "replacement as UTF-8"},
+      {utf8("<b>x</b>"), utf8(""), utf8("x"), "empty replacement"},
+      {null_string(), utf8("-"), none(), "null"},
+  };
+  for (const auto& row : rows) {
+    SCOPED_TRACE(row.why);
+    EXPECT_TRUE(same(call<Str>(kTagsWith, row.in, row.replacement), row.want));
+  }
+}
+
+}  // namespace
