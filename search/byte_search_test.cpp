@@ -72,7 +72,7 @@ TEST(byte_search, table_driven_versions_match_the_reference) {
     for (auto& x : v) x = static_cast<std::uint8_t>(d(rng));
     return v;
   };
-  std::uniform_int_distribution<int> len(0, 300), set_len(0, 6), bound(-300, 300);
+  std::uniform_int_distribution<int> len(0, 300), set_len(0, 12), bound(-300, 300);
   for (int round = 0; round < 3000; ++round) {
     const auto target = random_bytes(len(rng), round % 2 ? 0 : 100, 255);
     const auto set = random_bytes(set_len(rng), 0, 255);
@@ -82,6 +82,30 @@ TEST(byte_search, table_driven_versions_match_the_reference) {
     ASSERT_EQ(find_in_ranges(target, ranges), detail::find_in_ranges_scalar(target, ranges));
     ASSERT_EQ(find_in_signed_ranges_or_set(target, ranges, set),
               detail::find_in_signed_ranges_or_set_scalar(target, ranges, set));
+  }
+}
+
+// One matching byte at every position of every length up to three vector
+// rounds, at every misalignment: the vector skip must stop in the right
+// block and never read past the end.
+TEST(byte_search, vector_skip_finds_every_position) {
+  std::vector<std::uint8_t> buffer(200, 'a');
+  const byte_range control[] = {{0, 31}};
+  const byte_range high_signed[] = {{-128, -1}};
+  for (std::size_t offset = 0; offset < 16; ++offset) {
+    for (std::size_t length = 0; length <= 96; ++length) {
+      const bytes_view target(buffer.data() + offset, length);
+      for (std::size_t at = 0; at <= length; ++at) {
+        std::vector<std::uint8_t> saved(buffer);
+        if (at < length) buffer[offset + at] = '\n';
+        if (at + 1 < length) buffer[offset + at + 1] = 0xE9;
+        const std::int64_t want = at < length ? static_cast<std::int64_t>(at) + 1 : 0;
+        ASSERT_EQ(find_first_of(target, b("\r\n")), want) << offset << " " << length;
+        ASSERT_EQ(find_in_ranges(target, control), want) << offset << " " << length;
+        ASSERT_EQ(find_in_signed_ranges_or_set(target, high_signed, b("\n")), want);
+        buffer = saved;
+      }
+    }
   }
 }
 
