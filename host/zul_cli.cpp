@@ -165,18 +165,25 @@ std::optional<DynamicValue> parse_argument(ValueType type, std::string_view text
 std::optional<std::string> choose_overload(const Registration& registration, std::string_view name,
                                            const std::vector<std::string>& args,
                                            std::vector<DynamicValue>& values) {
-  for (const RegisteredMethod& m : registration.methods) {
-    const auto d = parse_declaration(m.declaration);
-    if (!d || d->name != name || d->params.size() != args.size()) continue;
-    std::vector<DynamicValue> parsed;
-    for (std::size_t i = 0; i < args.size(); ++i) {
-      auto v = parse_argument(d->params[i].type, args[i]);
-      if (!v) break;
-      parsed.push_back(std::move(*v));
-    }
-    if (parsed.size() == args.size()) {
-      values = std::move(parsed);
-      return m.declaration;
+  // First pass: exactly that many parameters. Second: trailing parameters
+  // left out are filled from their declared defaults.
+  for (const bool with_defaults : {false, true}) {
+    for (const RegisteredMethod& m : registration.methods) {
+      const auto d = parse_declaration(m.declaration);
+      if (!d || d->name != name) continue;
+      if (with_defaults ? d->params.size() <= args.size() : d->params.size() != args.size()) continue;
+      std::vector<DynamicValue> parsed;
+      for (std::size_t i = 0; i < d->params.size(); ++i) {
+        const Parameter& p = d->params[i];
+        if (i >= args.size() && !p.default_value) break;
+        auto v = parse_argument(p.type, i < args.size() ? std::string_view(args[i]) : *p.default_value);
+        if (!v) break;
+        parsed.push_back(std::move(*v));
+      }
+      if (parsed.size() == d->params.size()) {
+        values = std::move(parsed);
+        return m.declaration;
+      }
     }
   }
   return std::nullopt;

@@ -30,8 +30,10 @@ std::optional<DynamicValue> parse_argument(ValueType type, std::string_view text
 
 // The declaration to call for name and these arguments: among the
 // registered declarations with that name and that many parameters, the
-// first in registration order whose parameters all accept their arguments.
-// values receives the parsed arguments. nullopt when none fits.
+// first in registration order whose parameters all accept their arguments;
+// failing that, one whose trailing parameters left out all have defaults
+// (taken as written in the declaration). values receives the arguments.
+// nullopt when none fits.
 std::optional<std::string> choose_overload(const Registration& registration, std::string_view name,
                                            const std::vector<std::string>& args,
                                            std::vector<DynamicValue>& values);

@@ -108,6 +108,37 @@ TEST(format_value, text_hex_numbers_and_arrays) {
   }
 }
 
+TEST(choose_overload, kinds_counts_and_defaults) {
+  Registration r;
+  for (const char* d : {"F(a as integer) as string", "F(a as string) as string",
+                        "G(a as string, n as integer = 3) as string", "G(a as string, b as string) as string"}) {
+    r.methods.push_back({d});
+  }
+  struct {
+    std::string_view name;
+    std::vector<std::string> args;
+    std::optional<std::string> want;
+    std::int64_t want_last_integer;
+    const char* why;
+  } rows[] = {
+      {"F", {"5"}, "F(a as integer) as string", 5, "integer literal prefers the integer overload"},
+      {"F", {"5x"}, "F(a as string) as string", 0, "anything else goes to the string one"},
+      {"G", {"s", "4"}, "G(a as string, n as integer = 3) as string", 4, "given explicitly"},
+      {"G", {"s", "t"}, "G(a as string, b as string) as string", 0, "second overload"},
+      {"G", {"s"}, "G(a as string, n as integer = 3) as string", 3, "default filled in"},
+      {"G", {}, std::nullopt, 0, "a has no default"},
+      {"H", {"x"}, std::nullopt, 0, "unknown name"},
+  };
+  for (const auto& row : rows) {
+    SCOPED_TRACE(row.why);
+    std::vector<DynamicValue> values;
+    EXPECT_EQ(choose_overload(r, row.name, row.args, values), row.want);
+    if (row.want && values.back().type == ValueType::integer) {
+      EXPECT_EQ(values.back().integer, row.want_last_integer);
+    }
+  }
+}
+
 struct ZulRun {
   int status;
   std::string out, err;
