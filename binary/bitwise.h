@@ -1,0 +1,55 @@
+// Bitwise combination of a data string with a repeating mask: AND, OR, XOR,
+// and XOR mixed with each byte's position. The data sets the result length;
+// the mask repeats from its start (or from a chosen offset for XOR) and is
+// cut at the data's end. Every function has a byte-at-a-time reference in
+// detail:: that the word-at-a-time paths are tested against.
+#pragma once
+
+#include <cstddef>
+#include <cstdint>
+#include <span>
+#include <string>
+
+namespace zul::binary {
+
+using bytes_view = std::span<const std::uint8_t>;
+
+// data[i] AND mask[i mod m]. Empty data or an empty mask give "".
+std::string and_with_mask(bytes_view data, bytes_view mask);
+
+// data[i] OR mask[i mod m]. Empty data or an empty mask give "".
+std::string or_with_mask(bytes_view data, bytes_view mask);
+
+// data[i] XOR mask[(offset + i) mod m]. The offset is reduced modulo the mask
+// length, floored (-1 is the last mask byte), so the mask position never
+// leaves the mask. Applying it twice with the same mask and offset gives the
+// data back. Empty data or an empty mask give "".
+std::string xor_with_mask(bytes_view data, bytes_view mask, std::int64_t offset);
+
+// As xor_with_mask, then each byte is also XORed with the low eight bits of
+// its own position (0, 1, ..., 255, 0, ...). Its own inverse, too.
+std::string xor_with_mask_and_position(bytes_view data, bytes_view mask, std::int64_t offset);
+
+namespace detail {
+
+enum class bit_op { kAnd, kOr, kXor };
+
+// The mask index that meets data byte 0: offset floored modulo m (m >= 1).
+std::size_t mask_start(std::int64_t offset, std::size_t m);
+
+// The byte rule, one byte at a time: out[i] = data[i] op mask[(start + i) mod
+// m], for i < data.size(). out has room for data.size() bytes; m >= 1 and
+// start < m. The reference that the fast paths must match.
+void combine_scalar(bit_op op, bytes_view data, bytes_view mask, std::size_t start,
+                    std::uint8_t* out);
+
+// The same result as combine_scalar, eight bytes at a time where the mask
+// allows it; out may be data.data() itself.
+void combine_fast(bit_op op, bytes_view data, bytes_view mask, std::size_t start,
+                  std::uint8_t* out);
+
+// out[i] ^= i & 0xFF for i < n, word-wise.
+void xor_positions(std::uint8_t* out, std::size_t n);
+
+}  // namespace detail
+}  // namespace zul::binary
