@@ -1,0 +1,67 @@
+// Readable runs: the lead-byte table against a model that decodes each
+// code point, over every pair of leading bytes and the continuation edges.
+#include "binary/readable_runs.h"
+
+#include <gtest/gtest.h>
+
+#include <string>
+#include <string_view>
+
+namespace zul::binary {
+namespace {
+
+std::span<const std::uint8_t> bytes(std::string_view s) {
+  return {reinterpret_cast<const std::uint8_t*>(s.data()), s.size()};
+}
+
+// Length of the readable unit at s[i], by decoding the code point: the model
+// that the lead-byte table must agree with.
+std::size_t model_unit(std::string_view s, std::size_t i) {
+  const auto b = static_cast<unsigned char>(s[i]);
+  if (b == 9 || b == 10 || b == 13 || (b >= 0x20 && b <= 0x7E)) return 1;
+  std::size_t len = b >= 0xF0 && b < 0xF8 ? 4 : b >= 0xE0 && b < 0xF0 ? 3 : b >= 0xC0 && b < 0xE0 ? 2 : 0;
+  if (len == 0 || i + len > s.size()) return 0;
+  std::uint32_t cp = b & (0x7F >> len);
+  for (std::size_t k = 1; k < len; ++k) {
+    const auto c = static_cast<unsigned char>(s[i + k]);
+    if ((c & 0xC0) != 0x80) return 0;
+    cp = cp << 6 | (c & 0x3F);
+  }
+  const std::uint32_t min[] = {0, 0, 0x80, 0x800, 0x10000};
+  if (cp < min[len] || cp > 0x10FFFF || (cp >= 0xD800 && cp <= 0xDFFF)) return 0;
+  return len;
+}
+
+std::size_t model_run(std::string_view s) {
+  std::size_t i = 0;
+  while (i < s.size()) {
+    const std::size_t u = model_unit(s, i);
+    if (u == 0) break;
+    i += u;
+  }
+  return i;
+}
+
+// Every lead byte with every second byte, then a few third and fourth bytes
+// that straddle the continuation range.
+TEST(measure_run, agrees_with_decoding_model) {
+  const unsigned char tails[] = {0x41, 0x7F, 0x80, 0x8F, 0x90, 0x9F, 0xA0, 0xBF, 0xC0};
+  for (int a = 0; a < 256; ++a) {
+    for (int b = 0; b < 256; ++b) {
+      for (unsigned char c : tails) {
+        for (unsigned char d : {0x41, 0x80, 0xC0}) {
+          std::string s{static_cast<char>(a), static_cast<char>(b), static_cast<char>(c),
+                        static_cast<char>(d)};
+          for (std::size_t cut = 1; cut <= 4; cut += 3) {
+            const std::string_view v(s.data(), cut);
+            ASSERT_EQ(detail::measure_run(bytes(v), 0).length, model_run(v))
+                << std::hex << a << " " << b << " " << int{c} << " " << int{d} << " cut " << cut;
+          }
+        }
+      }
+    }
+  }
+}
+
+}  // namespace
+}  // namespace zul::binary
