@@ -1,0 +1,39 @@
+// UTF-8 validation and repair. Well-formed means exactly the table of
+// well-formed UTF-8 byte sequences of the Unicode Standard (Table 3-7): no
+// overlong forms, no surrogates D800..DFFF, nothing above 10FFFF; the zero
+// byte is an ordinary one-byte sequence. Repair keeps every well-formed
+// sequence byte for byte and puts a placeholder in place of each byte that
+// does not begin one, judging the next byte afresh.
+#pragma once
+
+#include <cstdint>
+#include <span>
+#include <string>
+#include <string_view>
+
+namespace zul::text {
+
+using bytes_view = std::span<const std::uint8_t>;
+
+// Length (1 to 4) of the well-formed sequence that bytes begins with, or 0
+// when its first byte begins none (also when the end cuts the sequence short
+// or bytes is empty).
+std::size_t well_formed_length(bytes_view bytes) noexcept;
+
+// Length of the longest prefix of bytes made of whole well-formed sequences:
+// the offset of the first byte that begins no well-formed sequence, or
+// bytes.size() when there is none. Skips ASCII a word at a time.
+std::size_t well_formed_prefix(bytes_view bytes) noexcept;
+
+// bytes with each byte that begins no well-formed sequence replaced by
+// placeholder (an empty placeholder drops such bytes). The output is
+// reserved once at bytes.size() + 4096 bytes. Throws std::bad_alloc or
+// std::length_error when the output cannot be allocated.
+std::string repair_utf8(bytes_view bytes, std::string_view placeholder);
+
+namespace detail {
+// Reference version: judges every position with well_formed_length.
+std::string repair_utf8_scalar(bytes_view bytes, std::string_view placeholder);
+}  // namespace detail
+
+}  // namespace zul::text
