@@ -1,0 +1,100 @@
+// Single-byte character sets: the reverse map against a plain table search
+// for every UTF-16 unit, the fast encoder against the unit-by-unit one on
+// random texts at every offset, and every byte through the decoder. The
+// conversions' examples run end to end in tests/text_convert_e2e_test.cpp.
+#include "text/latin1.h"
+
+#include <gtest/gtest.h>
+
+#include <cstring>
+#include <random>
+#include <string>
+#include <vector>
+
+namespace {
+
+using namespace zul::text;
+
+std::string bytes_of(const owned_handle& h) {
+  if (!h) return "(null)";
+  handle_lock lock(h.get());
+  return std::string(reinterpret_cast<const char*>(lock.data()), h.size());
+}
+
+std::u16string units_of(const owned_handle& h) {
+  std::u16string units(h.size() / 2, u'\0');
+  if (h) {
+    handle_lock lock(h.get());
+    std::memcpy(units.data(), lock.data(), units.size() * 2);
+  }
+  return units;
+}
+
+std::span<const std::uint16_t> span_of(std::u16string_view s) {
+  return {reinterpret_cast<const std::uint16_t*>(s.data()), s.size()};
+}
+
+std::span<const std::uint8_t> span_of(std::string_view s) {
+  return {reinterpret_cast<const std::uint8_t*>(s.data()), s.size()};
+}
+
+struct named_set {
+  const single_byte_charset& set;
+  const charset_table& table;
+  const char* name;
+};
+const named_set kSets[] = {{kISO8859_1, escapecharsISO8859, "ISO 8859-1"},
+                           {kWindows1252, escapecharsCP1252, "Windows-1252"}};
+
+TEST(byte_for_unit, agrees_with_the_table_search_for_every_unit) {
+  for (const auto& s : kSets) {
+    SCOPED_TRACE(s.name);
+    for (std::uint32_t unit = 0; unit <= 0xFFFF; ++unit) {
+      const auto u = static_cast<std::uint16_t>(unit);
+      ASSERT_EQ(byte_for_unit(s.set, u), detail::search_table(s.table, u)) << unit;
+    }
+  }
+}
+
+TEST(encode_single_byte, fast_path_matches_scalar_on_random_texts) {
+  // Mostly ASCII with Latin-1, C1, Windows-1252 punctuation, Greek and
+  // surrogate halves mixed in, so that word runs start and stop anywhere.
+  const std::uint16_t pool[] = {'a', 'Z', '0', ' ', 0x00, 0x7F, 0x80, 0x81, 0x9F, 0xE9,
+                                0xFF, 0x20AC, 0x2122, 0x0178, 0x03B1, 0xD83D, 0xDE00, 0xFFFF};
+  std::mt19937 random(1);
+  std::vector<std::uint16_t> text(80);
+  for (int round = 0; round < 3000; ++round) {
+    const bool ascii_heavy = round % 2 == 0;
+    for (auto& unit : text) {
+      unit = (ascii_heavy && random() % 8 != 0) ? static_cast<std::uint16_t>(0x20 + random() % 0x5F)
+                                                : pool[random() % std::size(pool)];
+    }
+    const std::size_t offset = random() % 4, length = random() % 76;
+    const std::span<const std::uint16_t> units(text.data() + offset, length);
+    for (const auto& s : kSets) {
+      ASSERT_EQ(bytes_of(encode_single_byte(units, s.set)),
+                bytes_of(detail::encode_single_byte_scalar(units, s.table)))
+          << s.name << " round " << round;
+    }
+  }
+}
+
+TEST(decode_single_byte, every_byte_gives_its_table_entry) {
+  std::string all;
+  for (int b = 0; b < 256; ++b) all += static_cast<char>(b);
+  for (const auto& s : kSets) {
+    SCOPED_TRACE(s.name);
+    const std::u16string units = units_of(decode_single_byte(span_of(all), s.set));
+    ASSERT_EQ(units.size(), 256u);
+    for (int b = 0; b < 256; ++b) EXPECT_EQ(units[b], s.table[b]) << b;
+  }
+}
+
+TEST(single_byte, handle_beyond_the_limit_gives_null) {
+  EXPECT_FALSE(decode_single_byte(span_of("abc"), kISO8859_1, 5));
+  EXPECT_EQ(bytes_of(decode_single_byte(span_of("abc"), kISO8859_1, 6)).size(), 6u);
+  EXPECT_FALSE(encode_single_byte(span_of(u"abc"), kISO8859_1, 2));
+  EXPECT_EQ(bytes_of(encode_single_byte(span_of(u"abc"), kISO8859_1, 3)), "abc");
+}
+
+}  // namespace
