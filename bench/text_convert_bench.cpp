@@ -1,0 +1,103 @@
+// Windows-1252 encoding (reverse map and ASCII words beside the plain table
+// search), decoding, and number formatting beside the C library's snprintf
+// on the same values. Calls the pure workers directly: no host in the loop.
+#include <benchmark/benchmark.h>
+
+#include <cstdio>
+#include <map>
+#include <random>
+#include <string>
+#include <vector>
+
+#include "text/latin1.h"
+#include "text/number_format.h"
+
+namespace {
+
+namespace txt = zul::text;
+
+// Western European prose: mostly ASCII, an accented letter or a typographic
+// quote every few words, and now and then a character the set lacks.
+const std::u16string& western_text(std::size_t units) {
+  static std::map<std::size_t, std::u16string> cache;
+  auto [it, fresh] = cache.try_emplace(units);
+  if (fresh) {
+    static constexpr std::u16string_view kWords = u"Caf\u00E9 cr\u00E8me \u201Cna\u00EFve\u201D \u20AC3 \u03A9 and more. ";
+    while (it->second.size() < units) it->second += kWords;
+    it->second.resize(units);
+  }
+  return it->second;
+}
+
+std::span<const std::uint16_t> units_of(const std::u16string& s) {
+  return {reinterpret_cast<const std::uint16_t*>(s.data()), s.size()};
+}
+
+void BM_encode_cp1252(benchmark::State& state) {
+  const auto units = units_of(western_text(static_cast<std::size_t>(state.range(0))));
+  for (auto _ : state) benchmark::DoNotOptimize(txt::encode_single_byte(units, txt::kWindows1252));
+  state.SetBytesProcessed(static_cast<std::int64_t>(state.iterations()) * state.range(0) * 2);
+}
+
+void BM_encode_cp1252_table_search(benchmark::State& state) {
+  const auto units = units_of(western_text(static_cast<std::size_t>(state.range(0))));
+  for (auto _ : state) {
+    benchmark::DoNotOptimize(txt::detail::encode_single_byte_scalar(units, txt::escapecharsCP1252));
+  }
+  state.SetBytesProcessed(static_cast<std::int64_t>(state.iterations()) * state.range(0) * 2);
+}
+
+void BM_decode_cp1252(benchmark::State& state) {
+  std::vector<std::uint8_t> bytes(static_cast<std::size_t>(state.range(0)));
+  std::mt19937 random(3);
+  for (auto& b : bytes) b = static_cast<std::uint8_t>(random());
+  for (auto _ : state) benchmark::DoNotOptimize(txt::decode_single_byte(bytes, txt::kWindows1252));
+  state.SetBytesProcessed(static_cast<std::int64_t>(state.iterations()) * state.range(0));
+}
+
+const std::vector<double>& sample_doubles() {
+  static const std::vector<double> values = [] {
+    std::vector<double> v;
+    std::mt19937_64 random(5);
+    std::uniform_real_distribution<double> mantissa(1.0, 10.0);
+    for (int i = 0; i < 256; ++i) v.push_back(std::ldexp(mantissa(random), static_cast<int>(random() % 100) - 50));
+    return v;
+  }();
+  return values;
+}
+
+void BM_format_plain(benchmark::State& state) {
+  std::size_t i = 0;
+  for (auto _ : state) benchmark::DoNotOptimize(txt::format_plain(sample_doubles()[i++ & 255]));
+}
+
+void BM_snprintf_fixed_99(benchmark::State& state) {
+  char buffer[500];
+  std::size_t i = 0;
+  for (auto _ : state) {
+    benchmark::DoNotOptimize(std::snprintf(buffer, sizeof buffer, "%.99f", sample_doubles()[i++ & 255]));
+  }
+}
+
+void BM_format_scientific(benchmark::State& state) {
+  std::size_t i = 0;
+  for (auto _ : state) benchmark::DoNotOptimize(txt::format_scientific(sample_doubles()[i++ & 255], 6));
+}
+
+void BM_snprintf_scientific(benchmark::State& state) {
+  char buffer[500];
+  std::size_t i = 0;
+  for (auto _ : state) {
+    benchmark::DoNotOptimize(std::snprintf(buffer, 499, "%.6e", sample_doubles()[i++ & 255]));
+  }
+}
+
+BENCHMARK(BM_encode_cp1252)->Arg(1 << 10)->Arg(1 << 20)->Arg(64 << 20);
+BENCHMARK(BM_encode_cp1252_table_search)->Arg(1 << 10)->Arg(1 << 20);
+BENCHMARK(BM_decode_cp1252)->Arg(1 << 10)->Arg(1 << 20)->Arg(64 << 20);
+BENCHMARK(BM_format_plain);
+BENCHMARK(BM_snprintf_fixed_99);
+BENCHMARK(BM_format_scientific);
+BENCHMARK(BM_snprintf_scientific);
+
+}  // namespace

@@ -1,0 +1,199 @@
+// Host adapters for the binary-string functions: each reads its arguments
+// through rbData / rbText holders, calls the pure worker and builds the host
+// result. Results of raw bytes carry the unknown encoding 0xFFFF (so the
+// builder marks all-ASCII results ASCII); hex text is ASCII; readable runs
+// are UTF-8. Failed allocations give the empty result, silently, except in
+// CreateStringZUL and HexstringZUL, which raise through the shared trap.
+#include <array>
+#include <cstdint>
+#include <limits>
+#include <new>
+#include <span>
+#include <string_view>
+
+#include "binary/bitwise.h"
+#include "binary/byte_strings.h"
+#include "binary/hex.h"
+#include "binary/hex_dump.h"
+#include "binary/readable_runs.h"
+#include "plugin/exceptions.h"
+#include "plugin/host_services.h"
+#include "plugin/natives.h"
+#include "plugin/rb_data.h"
+#include "plugin/rb_text.h"
+#include "plugin/results.h"
+
+namespace {
+
+using text_encoding::kASCII;
+using text_encoding::kUnknown;
+using text_encoding::kUTF8;
+
+// The longest string the host accepts from the result builder; longer
+// results would come back empty, so they are not computed at all.
+constexpr std::int64_t kMaxResult = 0x7FFFFFFF;
+
+// Runs body; any exception gives the empty result and nothing is reported.
+template <class R, class Body>
+R quietly(Body&& body) noexcept {
+  try {
+    return body();
+  } catch (...) {
+    return nullptr;
+  }
+}
+
+REALstring build_bytes(std::string_view bytes) { return build_string(bytes, kUnknown); }
+
+REALstring concat(REALstring a, REALstring b, REALstring c, REALstring d, REALstring e,
+                  REALstring f) {
+  return quietly<REALstring>([&] {
+    const rbData ra(a), rb(b), rc(c), rd(d), re(e), rf(f);
+    const std::array parts = {ra.bytes(), rb.bytes(), rc.bytes(),
+                              rd.bytes(), re.bytes(), rf.bytes()};
+    return build_bytes(zul::binary::concat_bytes(parts));
+  });
+}
+
+REALarray collect_runs(const void* data, std::int64_t size, std::int64_t min_length) {
+  if (size <= 0) return nullptr;
+  return quietly<REALarray>([&] {
+    StringArrayBuilder array;
+    if (data) {
+      const std::span bytes(static_cast<const std::uint8_t*>(data), static_cast<std::size_t>(size));
+      zul::binary::for_each_readable_run(bytes, min_length, [&](std::span<const std::uint8_t> run) {
+        array.append({reinterpret_cast<const char*>(run.data()), run.size()}, kUTF8);
+      });
+    }
+    return array.take();
+  });
+}
+
+}  // namespace
+
+REALstring StringAND(REALstring a, REALstring b) {
+  if (!a || !b) return nullptr;
+  return quietly<REALstring>([&] {
+    const rbData data(a), mask(b);
+    return build_bytes(zul::binary::and_with_mask(data.bytes(), mask.bytes()));
+  });
+}
+
+REALstring StringOR(REALstring a, REALstring b) {
+  if (!a || !b) return nullptr;
+  return quietly<REALstring>([&] {
+    const rbData data(a), mask(b);
+    return build_bytes(zul::binary::or_with_mask(data.bytes(), mask.bytes()));
+  });
+}
+
+REALstring StringXOR(REALstring data, REALstring mask, int64_t mask_offset) {
+  if (!data || !mask) return nullptr;
+  return quietly<REALstring>([&] {
+    const rbData d(data), m(mask);
+    return build_bytes(zul::binary::xor_with_mask(d.bytes(), m.bytes(), mask_offset));
+  });
+}
+
+REALstring StringXOR2(REALstring data, REALstring mask, int64_t mask_offset) {
+  if (!data || !mask) return nullptr;
+  return quietly<REALstring>([&] {
+    const rbData d(data), m(mask);
+    return build_bytes(zul::binary::xor_with_mask_and_position(d.bytes(), m.bytes(), mask_offset));
+  });
+}
+
+REALstring ConcatBinaryStringsZUL6(REALstring a, REALstring b, REALstring c, REALstring d,
+                                   REALstring e, REALstring f) {
+  return concat(a, b, c, d, e, f);
+}
+REALstring ConcatBinaryStringsZUL5(REALstring a, REALstring b, REALstring c, REALstring d,
+                                   REALstring e) {
+  return concat(a, b, c, d, e, nullptr);
+}
+REALstring ConcatBinaryStringsZUL4(REALstring a, REALstring b, REALstring c, REALstring d) {
+  return concat(a, b, c, d, nullptr, nullptr);
+}
+REALstring ConcatBinaryStringsZUL3(REALstring a, REALstring b, REALstring c) {
+  return concat(a, b, c, nullptr, nullptr, nullptr);
+}
+REALstring ConcatBinaryStringsZUL2(REALstring a, REALstring b) {
+  return concat(a, b, nullptr, nullptr, nullptr, nullptr);
+}
+
+REALstring CreateStringZUL(int64_t length, REALstring content) {
+  if (length < 1) return nullptr;
+  return trapped<REALstring>(nullptr, [&]() -> REALstring {
+    const rbData c(content);
+    // The work buffer holds length + one pattern unit + 4 bytes; a size that
+    // does not fit in 64 bits cannot be allocated.
+    const std::int64_t unit = c.length == 0 ? 1 : c.length;
+    if (length > std::numeric_limits<std::int64_t>::max() - unit - 4) throw std::bad_alloc();
+    if (length > kMaxResult) return nullptr;
+    const std::string bytes =
+        zul::binary::repeat_to_length(c.bytes(), static_cast<std::size_t>(length));
+    // A null content has no encoding to ask the host about; its zero bytes
+    // go out as raw bytes, which the builder marks ASCII.
+    return build_string(bytes, content ? REALGetStringEncoding(content) : kUnknown);
+  });
+}
+
+REALstring RandomBytesStringZUL(int64_t length, signed char ascii) {
+  if (length < 1 || length > kMaxResult) return nullptr;
+  return quietly<REALstring>([&] {
+    const bool as_ascii = ascii != 0;
+    const std::string bytes = zul::binary::random_bytes(static_cast<std::size_t>(length), as_ascii);
+    return build_string(bytes, as_ascii ? kASCII : kUnknown);
+  });
+}
+
+REALstring EncodingToHex(REALstring s) {
+  if (!s) return nullptr;
+  return quietly<REALstring>([&]() -> REALstring {
+    const rbData in(s);
+    if (in.length < 1 || in.length > kMaxResult / 2) return nullptr;
+    return build_string(zul::binary::encode_hex(in.bytes()), kASCII);
+  });
+}
+
+REALstring DecodingToHex(REALstring s) {
+  return quietly<REALstring>([&]() -> REALstring {
+    rbText text(s);
+    const std::string_view digits = text.ascii();
+    if (digits.size() < 2) return nullptr;
+    return build_bytes(zul::binary::decode_hex(digits));
+  });
+}
+
+REALstring Hexstring(REALstring input, int64_t hexlen, int64_t linelen, REALstring linestart,
+                     REALstring lineend, REALstring spacer, REALstring filler) {
+  if (!input || hexlen == 0 || linelen == 0) return nullptr;
+  return trapped<REALstring>(nullptr, [&] {
+    const rbData in(input), fill(filler);
+    const rbData space(spacer), start(linestart), end(lineend);
+    const zul::binary::hex_dump_layout layout{hexlen,       linelen,      start.view(),
+                                              end.view(),   space.view(), fill.view()};
+    return build_string(zul::binary::hex_dump(in.bytes(), layout), kASCII);
+  });
+}
+
+REALarray GetStringsZULp(void* data, int64_t size, int64_t min_length) {
+  if (size < 0) return nullptr;
+  return collect_runs(data, size, min_length);
+}
+
+REALarray GetStringsZULm(REALmemoryBlock data, int64_t min_length) {
+  if (!data) return nullptr;
+  return quietly<REALarray>([&] {
+    const rbData block(data);
+    return collect_runs(block.data, block.length, min_length);
+  });
+}
+
+REALarray GetStringsZULs(REALstring data, int64_t min_length) {
+  if (!data) return nullptr;
+  return quietly<REALarray>([&] {
+    const rbData s(data);
+    return collect_runs(s.data, s.length, min_length);
+  });
+}
