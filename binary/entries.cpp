@@ -33,21 +33,11 @@ using text_encoding::kUTF8;
 // results would come back empty, so they are not computed at all.
 constexpr std::int64_t kMaxResult = 0x7FFFFFFF;
 
-// Runs body; any exception gives the empty result and nothing is reported.
-template <class R, class Body>
-R quietly(Body&& body) noexcept {
-  try {
-    return body();
-  } catch (...) {
-    return nullptr;
-  }
-}
-
 REALstring build_bytes(std::string_view bytes) { return build_string(bytes, kUnknown); }
 
 REALstring concat(REALstring a, REALstring b, REALstring c, REALstring d, REALstring e,
                   REALstring f) {
-  return quietly<REALstring>([&] {
+  return quietly<REALstring>(nullptr, [&] {
     const rbData ra(a), rb(b), rc(c), rd(d), re(e), rf(f);
     const std::array parts = {ra.bytes(), rb.bytes(), rc.bytes(),
                               rd.bytes(), re.bytes(), rf.bytes()};
@@ -57,7 +47,7 @@ REALstring concat(REALstring a, REALstring b, REALstring c, REALstring d, REALst
 
 REALarray collect_runs(const void* data, std::int64_t size, std::int64_t min_length) {
   if (size <= 0) return nullptr;
-  return quietly<REALarray>([&] {
+  return quietly<REALarray>(nullptr, [&] {
     StringArrayBuilder array;
     if (data) {
       const std::span bytes(static_cast<const std::uint8_t*>(data), static_cast<std::size_t>(size));
@@ -73,7 +63,7 @@ REALarray collect_runs(const void* data, std::int64_t size, std::int64_t min_len
 
 REALstring StringAND(REALstring a, REALstring b) {
   if (!a || !b) return nullptr;
-  return quietly<REALstring>([&] {
+  return quietly<REALstring>(nullptr, [&] {
     const rbData data(a), mask(b);
     return build_bytes(zul::binary::and_with_mask(data.bytes(), mask.bytes()));
   });
@@ -81,7 +71,7 @@ REALstring StringAND(REALstring a, REALstring b) {
 
 REALstring StringOR(REALstring a, REALstring b) {
   if (!a || !b) return nullptr;
-  return quietly<REALstring>([&] {
+  return quietly<REALstring>(nullptr, [&] {
     const rbData data(a), mask(b);
     return build_bytes(zul::binary::or_with_mask(data.bytes(), mask.bytes()));
   });
@@ -89,7 +79,7 @@ REALstring StringOR(REALstring a, REALstring b) {
 
 REALstring StringXOR(REALstring data, REALstring mask, int64_t mask_offset) {
   if (!data || !mask) return nullptr;
-  return quietly<REALstring>([&] {
+  return quietly<REALstring>(nullptr, [&] {
     const rbData d(data), m(mask);
     return build_bytes(zul::binary::xor_with_mask(d.bytes(), m.bytes(), mask_offset));
   });
@@ -97,7 +87,7 @@ REALstring StringXOR(REALstring data, REALstring mask, int64_t mask_offset) {
 
 REALstring StringXOR2(REALstring data, REALstring mask, int64_t mask_offset) {
   if (!data || !mask) return nullptr;
-  return quietly<REALstring>([&] {
+  return quietly<REALstring>(nullptr, [&] {
     const rbData d(data), m(mask);
     return build_bytes(zul::binary::xor_with_mask_and_position(d.bytes(), m.bytes(), mask_offset));
   });
@@ -140,7 +130,7 @@ REALstring CreateStringZUL(int64_t length, REALstring content) {
 
 REALstring RandomBytesStringZUL(int64_t length, signed char ascii) {
   if (length < 1 || length > kMaxResult) return nullptr;
-  return quietly<REALstring>([&] {
+  return quietly<REALstring>(nullptr, [&] {
     const bool as_ascii = ascii != 0;
     const std::string bytes = zul::binary::random_bytes(static_cast<std::size_t>(length), as_ascii);
     return build_string(bytes, as_ascii ? kASCII : kUnknown);
@@ -149,7 +139,7 @@ REALstring RandomBytesStringZUL(int64_t length, signed char ascii) {
 
 REALstring EncodingToHex(REALstring s) {
   if (!s) return nullptr;
-  return quietly<REALstring>([&]() -> REALstring {
+  return quietly<REALstring>(nullptr, [&]() -> REALstring {
     const rbData in(s);
     if (in.length < 1 || in.length > kMaxResult / 2) return nullptr;
     return build_string(zul::binary::encode_hex(in.bytes()), kASCII);
@@ -157,7 +147,7 @@ REALstring EncodingToHex(REALstring s) {
 }
 
 REALstring DecodingToHex(REALstring s) {
-  return quietly<REALstring>([&]() -> REALstring {
+  return quietly<REALstring>(nullptr, [&]() -> REALstring {
     rbText text(s);
     const std::string_view digits = text.ascii();
     if (digits.size() < 2) return nullptr;
@@ -184,7 +174,7 @@ REALarray GetStringsZULp(void* data, int64_t size, int64_t min_length) {
 
 REALarray GetStringsZULm(REALmemoryBlock data, int64_t min_length) {
   if (!data) return nullptr;
-  return quietly<REALarray>([&] {
+  return quietly<REALarray>(nullptr, [&] {
     const rbData block(data);
     return collect_runs(block.data, block.length, min_length);
   });
@@ -192,7 +182,7 @@ REALarray GetStringsZULm(REALmemoryBlock data, int64_t min_length) {
 
 REALarray GetStringsZULs(REALstring data, int64_t min_length) {
   if (!data) return nullptr;
-  return quietly<REALarray>([&] {
+  return quietly<REALarray>(nullptr, [&] {
     const rbData s(data);
     return collect_runs(s.data, s.length, min_length);
   });

@@ -35,17 +35,6 @@ REALstring same_string(REALstring s) {
   return s;
 }
 
-// For functions that report no failure: a buffer that cannot be allocated
-// gives the empty result and no host exception.
-template <class R, class Body>
-R quietly(R empty, Body&& body) noexcept {
-  try {
-    return body();
-  } catch (...) {
-    return empty;
-  }
-}
-
 REALstring build_utf32(const enc::code_points& text) {
   return REALBuildUnicodeString(text.data(), static_cast<std::int64_t>(text.size() * 4), kUTF32);
 }

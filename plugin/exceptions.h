@@ -38,3 +38,14 @@ R trapped(R empty, Body&& body) noexcept {
     return empty;
   }
 }
+
+// For functions that report no failure: returns body(), or empty when it
+// throws (a buffer that cannot be had), with no host exception raised.
+template <class R, class Body>
+R quietly(R empty, Body&& body) noexcept {
+  try {
+    return body();
+  } catch (...) {
+    return empty;
+  }
+}

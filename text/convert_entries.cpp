@@ -7,6 +7,7 @@
 #include <cstdint>
 
 #include "plugin/host_services.h"
+#include "plugin/exceptions.h"
 #include "plugin/natives.h"
 #include "plugin/rb_data.h"
 #include "plugin/rb_text.h"
@@ -20,18 +21,6 @@ namespace txt = zul::text;
 using namespace text_encoding;
 
 namespace {
-
-// For functions that report no failure: anything thrown on the way (an
-// allocation in the host layer) gives the empty result, never a host
-// exception, and never crosses into the host.
-template <class R, class Body>
-R quietly(R empty, Body&& body) noexcept {
-  try {
-    return body();
-  } catch (...) {
-    return empty;
-  }
-}
 
 // The host string of a handle's bytes; the handle stays locked while the
 // host copies them. A null handle gives the null string.
