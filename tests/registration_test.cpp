@@ -120,19 +120,12 @@ TEST(registration, runtime_question_is_asked_once) {
   }
 }
 
-// Every registered declaration is one of the table's, character for
-// character, and they come in the table's order.
+// All 64 declarations, character for character, in the table's order.
 TEST(registration, declarations_in_table_order) {
   Host host;
   host.load(ZUL_PLUGIN_PATH);
-  const auto got = declarations(host.registration());
-  std::size_t next = 0;
-  for (const std::string& d : got) {
-    const auto* end = std::end(kDeclarations);
-    const auto* at = std::find(std::begin(kDeclarations) + next, end, d);
-    ASSERT_NE(at, end) << "unknown or out of order: " << d;
-    next = static_cast<std::size_t>(at - std::begin(kDeclarations)) + 1;
-  }
+  const std::vector<std::string> want(std::begin(kDeclarations), std::end(kDeclarations));
+  EXPECT_EQ(declarations(host.registration()), want);
 }
 
 TEST(registration, html_and_xml_decoders_share_one_function) {
@@ -140,7 +133,7 @@ TEST(registration, html_and_xml_decoders_share_one_function) {
   host.load(ZUL_PLUGIN_PATH);
   void* html = host.find("DecodingFromHTMLZUL(s as string) as string");
   void* xml = host.find("DecodingFromXMLZUL(s as string) as string");
-  if (!html || !xml) GTEST_SKIP() << "decoders not registered in this build";
+  ASSERT_NE(html, nullptr);
   EXPECT_EQ(html, xml);
 }
 
