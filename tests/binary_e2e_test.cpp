@@ -27,7 +27,6 @@ const char *kRunsP = decl(1), *kRunsM = decl(2), *kRunsS = decl(3), *kRandom = d
            *kConcat6 = decl(52), *kConcat3 = decl(55), *kConcat2 = decl(56);
 
 const Str none = zul_host::null_string();
-Str ascii(std::string_view bytes) { return tagged(bytes, kASCII); }
 Str raw(std::string_view bytes) { return tagged(bytes, kUnknown); }
 std::string describe(const Str& s) {
   return s.null ? "null" : "\"" + s.bytes + "\" encoding " + std::to_string(s.encoding);

@@ -39,21 +39,6 @@ constexpr const char* kTagsWith =
 constexpr const char* kMySQL = "DecodingFromMySQLZUL(s as string) as string";
 constexpr const char* kBoolean = "SQLReplaceBooleanZUL(SQL as string) as string";
 
-// A wanted result: the null string, or bytes with an encoding.
-Str none() { return null_string(); }
-Str ascii(std::string_view bytes) { return tagged(bytes, kASCII); }
-Str unknown(std::string_view bytes) { return tagged(bytes, kUnknown); }
-
-testing::AssertionResult same(const Str& got, const Str& want) {
-  if (want.null && got.null) return testing::AssertionSuccess();
-  if (!want.null && !got.null && got.bytes == want.bytes && got.encoding == want.encoding) {
-    return testing::AssertionSuccess();
-  }
-  auto describe = [](const Str& s) {
-    return s.null ? std::string("null") : "\"" + s.bytes + "\" encoding " + std::to_string(s.encoding);
-  };
-  return testing::AssertionFailure() << "got " << describe(got) << ", want " << describe(want);
-}
 
 using Encodings = HostTest;
 

@@ -14,6 +14,26 @@
 #error "ZUL_PLUGIN_PATH must name the built plug-in library"
 #endif
 
+// Wanted results: the null string, or bytes with an encoding.
+inline zul_host::Str none() { return zul_host::null_string(); }
+inline zul_host::Str ascii(std::string_view bytes) { return zul_host::tagged(bytes, zul_host::kASCII); }
+inline zul_host::Str unknown(std::string_view bytes) {
+  return zul_host::tagged(bytes, zul_host::kUnknown);
+}
+
+// A result equals the wanted one: both null, or the same bytes and encoding.
+inline ::testing::AssertionResult same(const zul_host::Str& got, const zul_host::Str& want) {
+  if (want.null && got.null) return ::testing::AssertionSuccess();
+  if (!want.null && !got.null && got.bytes == want.bytes && got.encoding == want.encoding) {
+    return ::testing::AssertionSuccess();
+  }
+  auto describe = [](const zul_host::Str& s) {
+    return s.null ? std::string("null")
+                  : "\"" + s.bytes + "\" encoding " + std::to_string(s.encoding);
+  };
+  return ::testing::AssertionFailure() << "got " << describe(got) << ", want " << describe(want);
+}
+
 class HostTest : public ::testing::Test {
  protected:
   explicit HostTest(zul_host::HostConfig config = {}) : host_(std::move(config)) {

@@ -29,20 +29,6 @@ constexpr const char* kFromCP = "DecodingFromCP1252ZUL(s as string) as string";
 constexpr const char* kScientific = "ScientificStrZUL(d as double, digits as integer) as string";
 constexpr const char* kStr = "StrZUL(d as double) as string";
 
-Str none() { return null_string(); }
-Str ascii(std::string_view bytes) { return tagged(bytes, kASCII); }
-Str unknown(std::string_view bytes) { return tagged(bytes, kUnknown); }
-
-testing::AssertionResult same(const Str& got, const Str& want) {
-  if (want.null && got.null) return testing::AssertionSuccess();
-  if (!want.null && !got.null && got.bytes == want.bytes && got.encoding == want.encoding) {
-    return testing::AssertionSuccess();
-  }
-  auto describe = [](const Str& s) {
-    return s.null ? std::string("null") : "\"" + s.bytes + "\" encoding " + std::to_string(s.encoding);
-  };
-  return testing::AssertionFailure() << "got " << describe(got) << ", want " << describe(want);
-}
 
 using TextConvert = HostTest;
 

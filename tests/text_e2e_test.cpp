@@ -32,17 +32,6 @@ Str utf16le(std::u16string_view units) {
   return tagged(bytes, kUTF16);
 }
 
-testing::AssertionResult same(const Str& got, const Str& want) {
-  if (want.null && got.null) return testing::AssertionSuccess();
-  if (!want.null && !got.null && got.bytes == want.bytes && got.encoding == want.encoding) {
-    return testing::AssertionSuccess();
-  }
-  auto describe = [](const Str& s) {
-    return s.null ? std::string("null") : "\"" + s.bytes + "\" encoding " + std::to_string(s.encoding);
-  };
-  return testing::AssertionFailure() << "got " << describe(got) << ", want " << describe(want);
-}
-
 using Text = HostTest;
 
 // All three overloads see the same bytes; the result is marked UTF-8.
