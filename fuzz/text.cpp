@@ -1,0 +1,132 @@
+// Fuzz target for counting, distances, UTF-8 repair, byte classes, the
+// single-byte character sets and number formatting. The first byte picks
+// the function; the rest is the input.
+// Invariants:
+//  1. no crash, no read outside the input (run under the sanitizers);
+//  2. fast paths equal their references: UTF-8 repair, byte classes,
+//     single-byte encoding, the bit-vector edit distance;
+//  3. repaired text with a well-formed placeholder is well-formed;
+//     decoding then encoding ISO 8859-1 gives the bytes back;
+//  4. the number texts equal what an exact C library prints ("%.Ne" and
+//     "%.Nf"), which the C library of this machine is.
+#include <cmath>
+#include <cstdint>
+#include <cstdio>
+#include <cstdlib>
+#include <cstring>
+#include <span>
+#include <string>
+#include <string_view>
+#include <vector>
+
+#include "search/distance.h"
+#include "text/char_class.h"
+#include "text/latin1.h"
+#include "text/number_format.h"
+#include "text/utf8_repair.h"
+
+namespace {
+
+using namespace zul::text;
+
+void check(bool ok) {
+  if (!ok) std::abort();
+}
+
+std::span<const std::uint8_t> bytes_of(std::string_view s) {
+  return {reinterpret_cast<const std::uint8_t*>(s.data()), s.size()};
+}
+
+std::string handle_bytes(const owned_handle& h) {
+  if (!h) return {};
+  const handle_lock lock(h.get());
+  return {reinterpret_cast<const char*>(lock.data()), h.size()};
+}
+
+void check_repair(std::span<const std::uint8_t> data, std::uint8_t knob) {
+  static constexpr std::string_view kPlaceholders[] = {"", "?", "\xEF\xBF\xBD", "\xFF"};
+  const std::string_view placeholder = kPlaceholders[knob % 4];
+  const std::string repaired = repair_utf8(data, placeholder);
+  check(repaired == detail::repair_utf8_scalar(data, placeholder));
+  if (knob % 4 != 3) check(well_formed_prefix(bytes_of(repaired)) == repaired.size());
+  check(well_formed_prefix(data) <= data.size());
+}
+
+void check_classes(std::span<const std::uint8_t> data, std::uint8_t replacement) {
+  for (auto cls : {byte_class::seven_bit, byte_class::printable, byte_class::non_control}) {
+    check(all_bytes_in(data, cls) == detail::all_bytes_in_scalar(data, cls));
+  }
+  const std::string replaced = replace_non_printable(data, replacement);
+  check(replaced.size() == data.size());
+  for (std::size_t i = 0; i < data.size(); ++i) {
+    const bool kept = data[i] >= 0x20 && data[i] <= 0x7F;
+    check(static_cast<std::uint8_t>(replaced[i]) == (kept ? data[i] : replacement));
+  }
+}
+
+void check_single_byte(std::span<const std::uint8_t> data) {
+  std::vector<std::uint16_t> units(data.size() / 2);
+  std::memcpy(units.data(), data.data(), units.size() * 2);
+  check(handle_bytes(encode_single_byte(units, kISO8859_1)) ==
+        handle_bytes(detail::encode_single_byte_scalar(units, escapecharsISO8859)));
+  check(handle_bytes(encode_single_byte(units, kWindows1252)) ==
+        handle_bytes(detail::encode_single_byte_scalar(units, escapecharsCP1252)));
+  const owned_handle wide = decode_single_byte(data, kISO8859_1);
+  const std::string decoded = handle_bytes(wide);
+  std::vector<std::uint16_t> back(decoded.size() / 2);
+  std::memcpy(back.data(), decoded.data(), back.size() * 2);
+  check(handle_bytes(encode_single_byte(back, kISO8859_1)) == std::string(data.begin(), data.end()));
+}
+
+void check_distances(std::span<const std::uint8_t> data, std::uint8_t knob) {
+  // Small alphabets make matches and transpositions likely.
+  const std::uint32_t alphabet = 2 + knob % 8;
+  std::vector<std::uint32_t> a, b;
+  const std::size_t split = data.empty() ? 0 : knob % (data.size() + 1);
+  for (std::size_t i = 0; i < data.size(); ++i) (i < split ? a : b).push_back(0x60 + data[i] % alphabet);
+  if (!a.empty() && !b.empty()) {
+    check(zul::search::detail::edit_distance_bits(a, b) == zul::search::detail::edit_distance_rows(a, b));
+  }
+  const auto jw = zul::search::jaro_winkler_distance(a, b);
+  check(jw.unallocated_bytes == 0 && jw.value >= 0.0 && jw.value <= 1.0);
+}
+
+void check_numbers(std::span<const std::uint8_t> data, std::uint8_t knob) {
+  if (data.size() < 8) return;
+  double d;
+  std::memcpy(&d, data.data(), sizeof d);
+  if (std::isnan(d)) return;  // the C library may print "-nan"
+  char want[600];
+  const int digits = knob % 40;
+  std::snprintf(want, sizeof want, "%.*e", digits, d);
+  check(format_scientific(d, digits).view() == want);
+  const int precision = knob % 120;
+  std::snprintf(want, sizeof want, "%.*f", precision, d);
+  check(detail::format_fixed(d, precision).view() == std::string_view(want).substr(0, 499));
+  check(format_plain(d).size > 0);
+}
+
+}  // namespace
+
+extern "C" int LLVMFuzzerTestOneInput(const std::uint8_t* data, std::size_t size) {
+  if (size < 2) return 0;
+  const std::span<const std::uint8_t> rest(data + 2, size - 2);
+  switch (data[0] % 5) {
+    case 0:
+      check_repair(rest, data[1]);
+      break;
+    case 1:
+      check_classes(rest, data[1]);
+      break;
+    case 2:
+      check_single_byte(rest);
+      break;
+    case 3:
+      check_distances(rest, data[1]);
+      break;
+    default:
+      check_numbers(rest, data[1]);
+      break;
+  }
+  return 0;
+}
