@@ -20,6 +20,15 @@ inline zul_host::Str ascii(std::string_view bytes) { return zul_host::tagged(byt
 inline zul_host::Str unknown(std::string_view bytes) {
   return zul_host::tagged(bytes, zul_host::kUnknown);
 }
+// UTF-16 text in the host's (little-endian) byte order, from code units.
+inline zul_host::Str utf16(std::u16string_view units) {
+  std::string bytes;
+  for (const char16_t u : units) {
+    bytes += static_cast<char>(u & 0xFF);
+    bytes += static_cast<char>(u >> 8);
+  }
+  return zul_host::tagged(bytes, zul_host::kUTF16);
+}
 
 // A result equals the wanted one: both null, or the same bytes and encoding.
 inline ::testing::AssertionResult same(const zul_host::Str& got, const zul_host::Str& want) {

@@ -20,16 +20,6 @@ constexpr const char* kCompChars = "StrCompCharactersZUL(a as string, b as strin
 constexpr const char* kJaro = "JaroWinklerDistanceZUL(a as string, b as string) as double";
 constexpr const char* kEdit = "LevenshteinDistanceZUL(a as string, b as string) as double";
 
-// UTF-16 in host (little-endian) byte order, from UTF-16 code units.
-Str utf16(std::u16string_view units) {
-  std::string bytes;
-  for (const char16_t u : units) {
-    bytes += static_cast<char>(u & 0xFF);
-    bytes += static_cast<char>(u >> 8);
-  }
-  return tagged(bytes, kUTF16);
-}
-
 using Search = HostTest;
 
 TEST_F(Search, count_occurrences) {
