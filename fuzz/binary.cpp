@@ -20,18 +20,14 @@
 #include "binary/hex_dump.h"
 #include "binary/readable_runs.h"
 #include "text/utf8_repair.h"
+#include "fuzz/fuzz_check.h"
 
 namespace {
 
+using zul_fuzz::bytes_of;
+using zul_fuzz::check;
+
 using namespace zul::binary;
-
-void check(bool ok) {
-  if (!ok) std::abort();
-}
-
-std::span<const std::uint8_t> bytes_of(std::string_view s) {
-  return {reinterpret_cast<const std::uint8_t*>(s.data()), s.size()};
-}
 
 void check_bitwise(std::span<const std::uint8_t> data, std::span<const std::uint8_t> mask, std::int64_t offset) {
   if (mask.empty()) return;

@@ -17,16 +17,10 @@
 #include "encodings/sql.h"
 #include "encodings/url.h"
 #include "encodings/yenc.h"
+#include "fuzz/fuzz_check.h"
 
-namespace {
-
+using zul_fuzz::check;
 namespace enc = zul::encodings;
-
-void check(bool ok) {
-  if (!ok) std::abort();
-}
-
-}  // namespace
 
 extern "C" int LLVMFuzzerTestOneInput(const std::uint8_t* data, std::size_t size) {
   if (size < 1) return 0;

@@ -9,16 +9,10 @@
 #include <span>
 
 #include "search/byte_search.h"
+#include "fuzz/fuzz_check.h"
 
-namespace {
-
+using zul_fuzz::check;
 using namespace zul::search;
-
-void check(bool ok) {
-  if (!ok) std::abort();
-}
-
-}  // namespace
 
 extern "C" int LLVMFuzzerTestOneInput(const std::uint8_t* data, std::size_t size) {
   if (size < 8) return 0;

@@ -24,18 +24,14 @@
 #include "text/latin1.h"
 #include "text/number_format.h"
 #include "text/utf8_repair.h"
+#include "fuzz/fuzz_check.h"
 
 namespace {
 
+using zul_fuzz::bytes_of;
+using zul_fuzz::check;
+
 using namespace zul::text;
-
-void check(bool ok) {
-  if (!ok) std::abort();
-}
-
-std::span<const std::uint8_t> bytes_of(std::string_view s) {
-  return {reinterpret_cast<const std::uint8_t*>(s.data()), s.size()};
-}
 
 std::string handle_bytes(const owned_handle& h) {
   if (!h) return {};
