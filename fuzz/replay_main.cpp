@@ -30,9 +30,9 @@ int main(int argc, char** argv) {
       for (const auto& entry : std::filesystem::recursive_directory_iterator(arg)) {
         if (entry.is_regular_file()) run_file(entry.path()), ++files;
       }
-    } else {
+    } else if (std::filesystem::is_regular_file(arg)) {
       run_file(arg), ++files;
-    }
+    }  // a target without a corpus folder yet: random inputs only
   }
   // Random inputs biased towards the bytes decoders care about.
   std::mt19937 rng(20261123);
