@@ -58,7 +58,8 @@ BENCHMARK(BM_jaro_winkler);
 // 1 MiB of text: arg 0 plain ASCII, arg 1 mixed Latin text with accents,
 // emoji and one broken byte per KiB.
 std::string make_utf8_text(int kind) {
-  const std::string words[] = {"plain ", "caf\xC3\xA9 ", "na\xC3\xAFve ", "\xF0\x9F\x98\x80 ", "text "};
+  const std::string words[] = {"plain ", "caf\xC3\xA9 ", "na\xC3\xAFve ", "\xF0\x9F\x98\x80 ",
+                               "text "};
   std::string text;
   std::size_t k = 0;
   while (text.size() < (1u << 20)) {
@@ -91,7 +92,8 @@ BENCHMARK(BM_repair_utf8)->Arg(0)->Arg(1);
 
 void BM_repair_utf8_scalar(benchmark::State& state) {
   const std::string& in = utf8_text(static_cast<int>(state.range(0)));
-  for (auto _ : state) benchmark::DoNotOptimize(zul::text::detail::repair_utf8_scalar(bytes(in), "?"));
+  for (auto _ : state)
+    benchmark::DoNotOptimize(zul::text::detail::repair_utf8_scalar(bytes(in), "?"));
   state.SetBytesProcessed(state.iterations() * static_cast<std::int64_t>(in.size()));
 }
 BENCHMARK(BM_repair_utf8_scalar)->Arg(0)->Arg(1);
@@ -108,7 +110,8 @@ BENCHMARK(BM_all_bytes_in);
 void BM_all_bytes_in_scalar(benchmark::State& state) {
   const std::string& in = utf8_text(0);
   for (auto _ : state) {
-    benchmark::DoNotOptimize(zul::text::detail::all_bytes_in_scalar(bytes(in), zul::text::byte_class::printable));
+    benchmark::DoNotOptimize(
+        zul::text::detail::all_bytes_in_scalar(bytes(in), zul::text::byte_class::printable));
   }
   state.SetBytesProcessed(state.iterations() * static_cast<std::int64_t>(in.size()));
 }

@@ -33,7 +33,8 @@ const enc::code_points& mixed_code_points(std::size_t size) {
   auto [it, fresh] = cache.try_emplace(size);
   if (fresh) {
     static constexpr std::u32string_view kWord = U"Tom & Jerry's <b>caf\u00E9</b> \u20AC ";
-    while (it->second.size() < size / 4) it->second.insert(it->second.end(), kWord.begin(), kWord.end());
+    while (it->second.size() < size / 4)
+      it->second.insert(it->second.end(), kWord.begin(), kWord.end());
     it->second.resize(size / 4);
   }
   return it->second;
@@ -54,13 +55,15 @@ void BM_html(benchmark::State& state) {
 }
 
 void BM_decode_url(benchmark::State& state) {
-  const std::string encoded = enc::encode_url(mixed_text(static_cast<std::size_t>(state.range(0))), 1);
+  const std::string encoded =
+      enc::encode_url(mixed_text(static_cast<std::size_t>(state.range(0))), 1);
   for (auto _ : state) benchmark::DoNotOptimize(enc::decode_url(encoded, 1));
   state.SetBytesProcessed(static_cast<std::int64_t>(state.iterations() * encoded.size()));
 }
 
 void BM_decode_html(benchmark::State& state) {
-  const std::string encoded = enc::encode_html(mixed_code_points(static_cast<std::size_t>(state.range(0))), 0);
+  const std::string encoded =
+      enc::encode_html(mixed_code_points(static_cast<std::size_t>(state.range(0))), 0);
   const enc::code_points text(encoded.begin(), encoded.end());
   for (auto _ : state) benchmark::DoNotOptimize(enc::decode_html(text));
   state.SetBytesProcessed(static_cast<std::int64_t>(state.iterations() * text.size() * 4));

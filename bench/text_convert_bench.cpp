@@ -22,7 +22,8 @@ const std::u16string& western_text(std::size_t units) {
   static std::map<std::size_t, std::u16string> cache;
   auto [it, fresh] = cache.try_emplace(units);
   if (fresh) {
-    static constexpr std::u16string_view kWords = u"Caf\u00E9 cr\u00E8me \u201Cna\u00EFve\u201D \u20AC3 \u03A9 and more. ";
+    static constexpr std::u16string_view kWords =
+        u"Caf\u00E9 cr\u00E8me \u201Cna\u00EFve\u201D \u20AC3 \u03A9 and more. ";
     while (it->second.size() < units) it->second += kWords;
     it->second.resize(units);
   }
@@ -60,7 +61,8 @@ const std::vector<double>& sample_doubles() {
     std::vector<double> v;
     std::mt19937_64 random(5);
     std::uniform_real_distribution<double> mantissa(1.0, 10.0);
-    for (int i = 0; i < 256; ++i) v.push_back(std::ldexp(mantissa(random), static_cast<int>(random() % 100) - 50));
+    for (int i = 0; i < 256; ++i)
+      v.push_back(std::ldexp(mantissa(random), static_cast<int>(random() % 100) - 50));
     return v;
   }();
   return values;
@@ -75,13 +77,15 @@ void BM_snprintf_fixed_99(benchmark::State& state) {
   char buffer[500];
   std::size_t i = 0;
   for (auto _ : state) {
-    benchmark::DoNotOptimize(std::snprintf(buffer, sizeof buffer, "%.99f", sample_doubles()[i++ & 255]));
+    benchmark::DoNotOptimize(
+        std::snprintf(buffer, sizeof buffer, "%.99f", sample_doubles()[i++ & 255]));
   }
 }
 
 void BM_format_scientific(benchmark::State& state) {
   std::size_t i = 0;
-  for (auto _ : state) benchmark::DoNotOptimize(txt::format_scientific(sample_doubles()[i++ & 255], 6));
+  for (auto _ : state)
+    benchmark::DoNotOptimize(txt::format_scientific(sample_doubles()[i++ & 255], 6));
 }
 
 void BM_snprintf_scientific(benchmark::State& state) {

@@ -26,13 +26,22 @@ constexpr std::array<std::uint8_t, 256> kPositions = [] {
 }();
 
 struct and_op {
-  template <class T> T operator()(T a, T b) const { return static_cast<T>(a & b); }
+  template <class T>
+  T operator()(T a, T b) const {
+    return static_cast<T>(a & b);
+  }
 };
 struct or_op {
-  template <class T> T operator()(T a, T b) const { return static_cast<T>(a | b); }
+  template <class T>
+  T operator()(T a, T b) const {
+    return static_cast<T>(a | b);
+  }
 };
 struct xor_op {
-  template <class T> T operator()(T a, T b) const { return static_cast<T>(a ^ b); }
+  template <class T>
+  T operator()(T a, T b) const {
+    return static_cast<T>(a ^ b);
+  }
 };
 
 std::uint64_t load(const std::uint8_t* p) {
@@ -113,9 +122,12 @@ void combine_scalar(bit_op op, bytes_view data, bytes_view mask, std::size_t sta
 void combine_fast(bit_op op, bytes_view data, bytes_view mask, std::size_t start,
                   std::uint8_t* out) {
   switch (op) {
-    case bit_op::kAnd: return combine_segments(and_op{}, data, mask, start, out);
-    case bit_op::kOr: return combine_segments(or_op{}, data, mask, start, out);
-    case bit_op::kXor: return combine_segments(xor_op{}, data, mask, start, out);
+    case bit_op::kAnd:
+      return combine_segments(and_op{}, data, mask, start, out);
+    case bit_op::kOr:
+      return combine_segments(or_op{}, data, mask, start, out);
+    case bit_op::kXor:
+      return combine_segments(xor_op{}, data, mask, start, out);
   }
 }
 

@@ -161,8 +161,8 @@ REALstring Hexstring(REALstring input, int64_t hexlen, int64_t linelen, REALstri
   return trapped<REALstring>(nullptr, [&] {
     const rbData in(input), fill(filler);
     const rbData space(spacer), start(linestart), end(lineend);
-    const zul::binary::hex_dump_layout layout{hexlen,       linelen,      start.view(),
-                                              end.view(),   space.view(), fill.view()};
+    const zul::binary::hex_dump_layout layout{hexlen,     linelen,      start.view(),
+                                              end.view(), space.view(), fill.view()};
     return build_string(zul::binary::hex_dump(in.bytes(), layout), kASCII);
   });
 }

@@ -14,12 +14,12 @@
 namespace zul::binary {
 
 struct hex_dump_layout {
-  std::int64_t hexlen = 2;        // group size in hex characters (2 = one byte)
-  std::int64_t linelen = 16;      // groups per line
-  std::string_view linestart;     // written before every line
-  std::string_view lineend;       // written after every line, the last one too
-  std::string_view spacer;        // written between two groups of one line
-  std::string_view filler;        // completes the last line; "" means "0"
+  std::int64_t hexlen = 2;     // group size in hex characters (2 = one byte)
+  std::int64_t linelen = 16;   // groups per line
+  std::string_view linestart;  // written before every line
+  std::string_view lineend;    // written after every line, the last one too
+  std::string_view spacer;     // written between two groups of one line
+  std::string_view filler;     // completes the last line; "" means "0"
 };
 
 // Results longer than this are never built (the host's string length limit).

@@ -19,7 +19,10 @@ std::span<const std::uint8_t> bytes(std::string_view s) {
 std::size_t model_unit(std::string_view s, std::size_t i) {
   const auto b = static_cast<unsigned char>(s[i]);
   if (b == 9 || b == 10 || b == 13 || (b >= 0x20 && b <= 0x7E)) return 1;
-  std::size_t len = b >= 0xF0 && b < 0xF8 ? 4 : b >= 0xE0 && b < 0xF0 ? 3 : b >= 0xC0 && b < 0xE0 ? 2 : 0;
+  std::size_t len = b >= 0xF0 && b < 0xF8   ? 4
+                    : b >= 0xE0 && b < 0xF0 ? 3
+                    : b >= 0xC0 && b < 0xE0 ? 2
+                                            : 0;
   if (len == 0 || i + len > s.size()) return 0;
   std::uint32_t cp = b & (0x7F >> len);
   for (std::size_t k = 1; k < len; ++k) {

@@ -45,7 +45,8 @@ REALstring build_utf32(const enc::code_points& text) {
 REALstring EncodingToURL2(REALstring s, int64_t options) {
   if (!s) return nullptr;
   rbData in(s);
-  return quietly<REALstring>(nullptr, [&] { return build_string(enc::encode_url(in.view(), options), kASCII); });
+  return quietly<REALstring>(
+      nullptr, [&] { return build_string(enc::encode_url(in.view(), options), kASCII); });
 }
 
 REALstring EncodingToURL1(REALstring s) { return EncodingToURL2(s, 0); }
@@ -54,7 +55,8 @@ REALstring DecodingToURL2(REALstring s, int64_t options) {
   if (!s) return nullptr;
   rbData in(s);
   if (in.length < 1) return nullptr;
-  return quietly<REALstring>(nullptr, [&] { return build_string(enc::decode_url(in.view(), options), kUnknown); });
+  return quietly<REALstring>(
+      nullptr, [&] { return build_string(enc::decode_url(in.view(), options), kUnknown); });
 }
 
 REALstring DecodingToURL1(REALstring s) { return DecodingToURL2(s, 0); }
@@ -146,7 +148,8 @@ REALstring yDecodeZULs(REALstring data) {
   if (!data) return nullptr;
   rbData in(data);
   if (in.length < 1) return nullptr;
-  return quietly<REALstring>(nullptr, [&] { return build_string(enc::decode_yenc(in.view()), kUnknown); });
+  return quietly<REALstring>(nullptr,
+                             [&] { return build_string(enc::decode_yenc(in.view()), kUnknown); });
 }
 
 REALmemoryBlock yDecodeZULm(REALmemoryBlock data) {
@@ -180,11 +183,13 @@ REALstring DecodingFromMySQL(REALstring s) {
   if (!s) return nullptr;
   rbData in(s);
   if (in.length < 1) return nullptr;
-  return quietly<REALstring>(nullptr, [&] { return build_string(enc::decode_mysql(in.view()), kUnknown); });
+  return quietly<REALstring>(nullptr,
+                             [&] { return build_string(enc::decode_mysql(in.view()), kUnknown); });
 }
 
 REALstring SQLReplaceBooleanZUL(REALstring sql) {
   if (!sql) return nullptr;
   rbText text(sql);
-  return quietly<REALstring>(nullptr, [&] { return build_string(enc::replace_sql_booleans(text.utf8()), kUTF8); });
+  return quietly<REALstring>(
+      nullptr, [&] { return build_string(enc::replace_sql_booleans(text.utf8()), kUTF8); });
 }

@@ -22,9 +22,13 @@ code_point_view skip_byte_order_mark(code_point_view text) {
 }
 
 // Controls other than tab, LF and CR are dropped from rewritten text.
-constexpr bool is_dropped_control(std::uint32_t c) { return c < 32 && c != 9 && c != 10 && c != 13; }
+constexpr bool is_dropped_control(std::uint32_t c) {
+  return c < 32 && c != 9 && c != 10 && c != 13;
+}
 
-constexpr bool is_markup(std::uint32_t c) { return c == '"' || c == '&' || c == '\'' || c == '<' || c == '>'; }
+constexpr bool is_markup(std::uint32_t c) {
+  return c == '"' || c == '&' || c == '\'' || c == '<' || c == '>';
+}
 
 void append_numeric_reference(std::string& out, std::uint32_t cp) {
   char digits[10];

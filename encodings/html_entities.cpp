@@ -19,7 +19,8 @@ constexpr bool table_is_well_formed() {
   }
   return kEntities[5].code_point == 0xA0 && kEntities[100].code_point == 0xFF;
 }
-static_assert(table_is_well_formed(), "entity rows must be sorted by code point, names 1-8, Latin-1 contiguous");
+static_assert(table_is_well_formed(),
+              "entity rows must be sorted by code point, names 1-8, Latin-1 contiguous");
 
 constexpr std::uint32_t kNbsp = 0xA0;
 
@@ -52,9 +53,9 @@ std::string_view entity_name(std::uint32_t cp, bool from_nbsp) {
 }
 
 std::optional<std::uint32_t> entity_code_point(std::string_view name) {
-  const auto* it = std::lower_bound(
-      kByName.begin(), kByName.end(), name,
-      [](const entity& row, std::string_view value) { return row.name < value; });
+  const auto* it =
+      std::lower_bound(kByName.begin(), kByName.end(), name,
+                       [](const entity& row, std::string_view value) { return row.name < value; });
   if (it == kByName.end() || it->name != name) return std::nullopt;
   return it->code_point;
 }

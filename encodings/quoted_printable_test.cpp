@@ -21,7 +21,9 @@ TEST(encode_quoted_printable, rules_and_line_lengths) {
     const char* why;
   } rows[] = {
       {"a=b", 72, "a=3Db", "equals sign"},
-      {"Gr\xC3\xBC\xC3\x9F" "e", 72, "Gr=C3=BC=C3=9Fe", "UTF-8 bytes"},
+      {"Gr\xC3\xBC\xC3\x9F"
+       "e",
+       72, "Gr=C3=BC=C3=9Fe", "UTF-8 bytes"},
       {"\x7F", 72, "=7F", "DEL"},
       {"\t", 72, "\t", "lone tab stays literal"},
       {"a \r\nb", 72, "a=20\r\nb=\r\n", "space before a break encoded"},
@@ -37,7 +39,8 @@ TEST(encode_quoted_printable, rules_and_line_lengths) {
       {a100, 0, std::string(70, 'a') + "=\r\n" + std::string(30, 'a'), "0 selects 72"},
       {a100, 1, std::string(70, 'a') + "=\r\n" + std::string(30, 'a'), "1 selects 72"},
       {a100, -5, std::string(70, 'a') + "=\r\n" + std::string(30, 'a'), "negative selects 72"},
-      {std::string_view(a100).substr(0, 20), (std::int64_t{1} << 32) + 20, std::string(18, 'a') + "=\r\naa", "low 32 bits: 20"},
+      {std::string_view(a100).substr(0, 20), (std::int64_t{1} << 32) + 20,
+       std::string(18, 'a') + "=\r\naa", "low 32 bits: 20"},
       {"ab", 2, "=\r\na=\r\nb", "2: a break before every character"},
       {"abc", 3, "a=\r\nb=\r\nc", "3: one character per line"},
       {"\xFF\xFF", 6, "=FF=\r\n=FF", "encoded bytes are never split"},
@@ -92,7 +95,8 @@ TEST(encode_quoted_printable, round_trips_every_byte_and_long_lines) {
     EXPECT_EQ(decode_quoted_printable(encoded), all);
     // No output line is longer than the limit allows (at least one character).
     std::size_t start = 0;
-    for (std::size_t end; (end = encoded.find("\r\n", start)) != std::string::npos; start = end + 2) {
+    for (std::size_t end; (end = encoded.find("\r\n", start)) != std::string::npos;
+         start = end + 2) {
       EXPECT_LE(end - start, static_cast<std::size_t>(std::max<std::int64_t>(line_length - 1, 4)));
     }
   }

@@ -54,7 +54,8 @@ std::string decode_mysql(std::string_view in) {
   std::size_t i = 0;
   while (i < n) {
     const void* slash = std::memchr(in.data() + i, '\\', n - i);
-    const std::size_t at = slash ? static_cast<std::size_t>(static_cast<const char*>(slash) - in.data()) : n;
+    const std::size_t at =
+        slash ? static_cast<std::size_t>(static_cast<const char*>(slash) - in.data()) : n;
     out.append(in.data() + i, at - i);
     i = at;
     if (i + 1 >= n) {  // no backslash, or a final one: kept as it is

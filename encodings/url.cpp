@@ -14,8 +14,8 @@ namespace zul::encodings {
 namespace {
 
 constexpr bool is_unreserved(unsigned b) {
-  return (b >= 'A' && b <= 'Z') || (b >= 'a' && b <= 'z') || (b >= '0' && b <= '9') ||
-         b == '!' || b == '*' || b == '-' || b == '.' || b == '@' || b == '_';
+  return (b >= 'A' && b <= 'Z') || (b >= 'a' && b <= 'z') || (b >= '0' && b <= '9') || b == '!' ||
+         b == '*' || b == '-' || b == '.' || b == '@' || b == '_';
 }
 
 bool space_as_plus(std::int64_t options) { return (options & 3) == 1; }
@@ -41,15 +41,18 @@ constexpr escape_table make_table(bool space_plus, bool plus_escaped) {
   return table;
 }
 
-constexpr escape_table kPlain = make_table(false, false);      // options 0, 3
-constexpr escape_table kSpacePlus = make_table(true, true);    // options 1
-constexpr escape_table kPlusEscaped = make_table(false, true); // options 2
+constexpr escape_table kPlain = make_table(false, false);       // options 0, 3
+constexpr escape_table kSpacePlus = make_table(true, true);     // options 1
+constexpr escape_table kPlusEscaped = make_table(false, true);  // options 2
 
 const escape_table& table_for(std::int64_t options) {
   switch (options & 3) {
-    case 1: return kSpacePlus;
-    case 2: return kPlusEscaped;
-    default: return kPlain;
+    case 1:
+      return kSpacePlus;
+    case 2:
+      return kPlusEscaped;
+    default:
+      return kPlain;
   }
 }
 

@@ -51,7 +51,10 @@ TEST(decode_url, malformed_and_truncated_escapes) {
       {"%41%4a%4A", 0, "AJJ", "either case"},
       {"%G1", 0, "\x01", "non-digit counts as 0"},
       {"%zz", 0, "\0"sv, "two non-digits"},
-      {"%%41", 0, "\x04" "1", "second % is a digit 0"},
+      {"%%41", 0,
+       "\x04"
+       "1",
+       "second % is a digit 0"},
       {"%4", 0, "@", "one digit at the end"},
       {"100%", 0, "100\0"sv, "% as the last byte"},
       {"a+b", 0, "a+b", "plus kept, options 0"},

@@ -12,7 +12,9 @@ constexpr bool is_markup(std::uint32_t c) {
   return c == '"' || c == '&' || c == '\'' || c == '<' || c == '>';
 }
 
-void append(code_points& out, std::string_view ascii) { out.insert(out.end(), ascii.begin(), ascii.end()); }
+void append(code_points& out, std::string_view ascii) {
+  out.insert(out.end(), ascii.begin(), ascii.end());
+}
 
 // Bytes a ready string may hold: 1..127 except the five markup bytes.
 constexpr std::array<bool, 256> kReadyByte = [] {
@@ -37,11 +39,21 @@ code_points encode_xml(code_point_view text, std::int64_t options) {
   out.reserve(text.size() + 4096);
   for (const std::uint32_t c : text) {
     switch (c) {
-      case '"': append(out, "&quot;"); break;
-      case '&': append(out, "&amp;"); break;
-      case '\'': append(out, named_apostrophe ? "&apos;" : "&#39;"); break;
-      case '<': append(out, "&lt;"); break;
-      case '>': append(out, "&gt;"); break;
+      case '"':
+        append(out, "&quot;");
+        break;
+      case '&':
+        append(out, "&amp;");
+        break;
+      case '\'':
+        append(out, named_apostrophe ? "&apos;" : "&#39;");
+        break;
+      case '<':
+        append(out, "&lt;");
+        break;
+      case '>':
+        append(out, "&gt;");
+        break;
       default:
         if (c >= 32 || c == 9 || c == 10 || c == 13) out.push_back(c);
     }

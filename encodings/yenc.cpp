@@ -16,7 +16,8 @@ std::string decode_yenc(std::string_view in) {
   std::size_t i = 0;
   while (i < n) {
     const void* eq = std::memchr(p + i, '=', n - i);
-    const std::size_t run = eq ? static_cast<std::size_t>(static_cast<const std::uint8_t*>(eq) - p) - i : n - i;
+    const std::size_t run =
+        eq ? static_cast<std::size_t>(static_cast<const std::uint8_t*>(eq) - p) - i : n - i;
     for (std::size_t k = 0; k < run; ++k) o[k] = static_cast<std::uint8_t>(p[i + k] - 42);
     o += run;
     i += run;

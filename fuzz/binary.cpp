@@ -19,8 +19,8 @@
 #include "binary/hex.h"
 #include "binary/hex_dump.h"
 #include "binary/readable_runs.h"
-#include "text/utf8_repair.h"
 #include "fuzz/fuzz_check.h"
+#include "text/utf8_repair.h"
 
 namespace {
 
@@ -29,7 +29,8 @@ using zul_fuzz::check;
 
 using namespace zul::binary;
 
-void check_bitwise(std::span<const std::uint8_t> data, std::span<const std::uint8_t> mask, std::int64_t offset) {
+void check_bitwise(std::span<const std::uint8_t> data, std::span<const std::uint8_t> mask,
+                   std::int64_t offset) {
   if (mask.empty()) return;
   const std::size_t start = detail::mask_start(offset, mask.size());
   check(start < mask.size());
@@ -42,7 +43,8 @@ void check_bitwise(std::span<const std::uint8_t> data, std::span<const std::uint
   const std::string once = xor_with_mask(data, mask, offset);
   check(xor_with_mask(bytes_of(once), mask, offset) == std::string(data.begin(), data.end()));
   const std::string mixed = xor_with_mask_and_position(data, mask, offset);
-  check(xor_with_mask_and_position(bytes_of(mixed), mask, offset) == std::string(data.begin(), data.end()));
+  check(xor_with_mask_and_position(bytes_of(mixed), mask, offset) ==
+        std::string(data.begin(), data.end()));
 }
 
 void check_hex(std::span<const std::uint8_t> data) {
@@ -58,9 +60,14 @@ void check_hex(std::span<const std::uint8_t> data) {
 void check_dump(std::span<const std::uint8_t> data, const std::uint8_t* knobs) {
   // Layout texts are cut from the data itself so that they vary too.
   const std::string_view text(reinterpret_cast<const char*>(data.data()), data.size());
-  auto piece = [&](std::size_t at, std::size_t n) { return text.substr(std::min(at, text.size()), n); };
-  const hex_dump_layout layout{static_cast<std::int8_t>(knobs[0]) / 8, static_cast<std::int8_t>(knobs[1]) / 8,
-                               piece(0, knobs[2] % 4), piece(1, knobs[2] / 4 % 4), piece(2, knobs[2] / 16 % 4),
+  auto piece = [&](std::size_t at, std::size_t n) {
+    return text.substr(std::min(at, text.size()), n);
+  };
+  const hex_dump_layout layout{static_cast<std::int8_t>(knobs[0]) / 8,
+                               static_cast<std::int8_t>(knobs[1]) / 8,
+                               piece(0, knobs[2] % 4),
+                               piece(1, knobs[2] / 4 % 4),
+                               piece(2, knobs[2] / 16 % 4),
                                piece(3, knobs[2] / 64)};
   check(hex_dump(data, layout).size() == detail::hex_dump_length(data.size(), layout));
 }

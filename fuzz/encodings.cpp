@@ -47,7 +47,8 @@ extern "C" int LLVMFuzzerTestOneInput(const std::uint8_t* data, std::size_t size
     case 4: {
       std::string flat(in);
       std::erase_if(flat, [](char c) { return c == '\r' || c == '\n'; });
-      check(enc::decode_quoted_printable(enc::encode_quoted_printable(flat, 4 + options * 8)) == flat);
+      check(enc::decode_quoted_printable(enc::encode_quoted_printable(flat, 4 + options * 8)) ==
+            flat);
       (void)enc::decode_quoted_printable(in);
       break;
     }

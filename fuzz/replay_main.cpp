@@ -36,8 +36,8 @@ int main(int argc, char** argv) {
   }
   // Random inputs biased towards the bytes decoders care about.
   std::mt19937 rng(20261123);
-  const std::uint8_t interesting[] = {0, '%', '&', ';', '#', '=', '<', '>', '\r', '\n', ' ', '+',
-                                      'a', 'F', '0', '9', 0x7F, 0x80, 0xC3, 0xE2, 0xF0, 0xFF};
+  const std::uint8_t interesting[] = {0,   '%', '&', ';', '#', '=',  '<',  '>',  '\r', '\n', ' ',
+                                      '+', 'a', 'F', '0', '9', 0x7F, 0x80, 0xC3, 0xE2, 0xF0, 0xFF};
   std::vector<std::uint8_t> input;
   constexpr int kRandomRuns = 20000;
   for (int run = 0; run < kRandomRuns; ++run) {

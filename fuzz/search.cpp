@@ -8,8 +8,8 @@
 #include <cstdlib>
 #include <span>
 
-#include "search/byte_search.h"
 #include "fuzz/fuzz_check.h"
+#include "search/byte_search.h"
 
 using zul_fuzz::check;
 using namespace zul::search;
@@ -18,9 +18,10 @@ extern "C" int LLVMFuzzerTestOneInput(const std::uint8_t* data, std::size_t size
   if (size < 8) return 0;
   const int which = data[0] % 3;
   const std::size_t set_length = data[1] % 8;
-  const byte_range ranges[] = {{static_cast<std::int8_t>(data[2]) * 3, static_cast<std::int8_t>(data[3]) * 3},
-                               {data[4], data[5]},
-                               {static_cast<std::int8_t>(data[6]), data[7]}};
+  const byte_range ranges[] = {
+      {static_cast<std::int8_t>(data[2]) * 3, static_cast<std::int8_t>(data[3]) * 3},
+      {data[4], data[5]},
+      {static_cast<std::int8_t>(data[6]), data[7]}};
   std::span<const std::uint8_t> rest(data + 8, size - 8);
   const std::size_t n = set_length < rest.size() ? set_length : rest.size();
   const auto set = rest.first(n);

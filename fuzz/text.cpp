@@ -19,12 +19,12 @@
 #include <string_view>
 #include <vector>
 
+#include "fuzz/fuzz_check.h"
 #include "search/distance.h"
 #include "text/char_class.h"
 #include "text/latin1.h"
 #include "text/number_format.h"
 #include "text/utf8_repair.h"
-#include "fuzz/fuzz_check.h"
 
 namespace {
 
@@ -76,7 +76,8 @@ void check_single_byte(std::span<const std::uint8_t> data) {
         handle_bytes(detail::encode_single_byte_scalar(units, escapecharsCP1252)));
   const owned_handle wide = decode_single_byte(data, kISO8859_1);
   const std::vector<std::uint16_t> back = units_of(handle_bytes(wide));
-  check(handle_bytes(encode_single_byte(back, kISO8859_1)) == std::string(data.begin(), data.end()));
+  check(handle_bytes(encode_single_byte(back, kISO8859_1)) ==
+        std::string(data.begin(), data.end()));
 }
 
 void check_distances(std::span<const std::uint8_t> data, std::uint8_t knob) {
@@ -84,9 +85,11 @@ void check_distances(std::span<const std::uint8_t> data, std::uint8_t knob) {
   const std::uint32_t alphabet = 2 + knob % 8;
   std::vector<std::uint32_t> a, b;
   const std::size_t split = data.empty() ? 0 : knob % (data.size() + 1);
-  for (std::size_t i = 0; i < data.size(); ++i) (i < split ? a : b).push_back(0x60 + data[i] % alphabet);
+  for (std::size_t i = 0; i < data.size(); ++i)
+    (i < split ? a : b).push_back(0x60 + data[i] % alphabet);
   if (!a.empty() && !b.empty()) {
-    check(zul::search::detail::edit_distance_bits(a, b) == zul::search::detail::edit_distance_rows(a, b));
+    check(zul::search::detail::edit_distance_bits(a, b) ==
+          zul::search::detail::edit_distance_rows(a, b));
   }
   const auto jw = zul::search::jaro_winkler_distance(a, b);
   check(jw.unallocated_bytes == 0 && jw.value >= 0.0 && jw.value <= 1.0);

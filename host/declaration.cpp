@@ -91,7 +91,8 @@ std::optional<Declaration> parse_declaration(std::string_view text) {
     std::size_t start = 0;
     while (true) {
       const std::size_t comma = list.find(',', start);
-      auto p = parse_parameter(list.substr(start, comma == std::string_view::npos ? comma : comma - start));
+      auto p = parse_parameter(
+          list.substr(start, comma == std::string_view::npos ? comma : comma - start));
       if (!p) return std::nullopt;
       d.params.push_back(std::move(*p));
       if (comma == std::string_view::npos) break;
@@ -113,14 +114,22 @@ std::optional<Declaration> parse_declaration(std::string_view text) {
 
 const char* type_name(ValueType type) {
   switch (type) {
-    case ValueType::none: return "none";
-    case ValueType::string: return "string";
-    case ValueType::integer: return "integer";
-    case ValueType::double_: return "double";
-    case ValueType::boolean: return "boolean";
-    case ValueType::ptr: return "ptr";
-    case ValueType::memory_block: return "memoryblock";
-    case ValueType::string_array: return "string()";
+    case ValueType::none:
+      return "none";
+    case ValueType::string:
+      return "string";
+    case ValueType::integer:
+      return "integer";
+    case ValueType::double_:
+      return "double";
+    case ValueType::boolean:
+      return "boolean";
+    case ValueType::ptr:
+      return "ptr";
+    case ValueType::memory_block:
+      return "memoryblock";
+    case ValueType::string_array:
+      return "string()";
   }
   return "none";
 }

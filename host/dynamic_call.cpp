@@ -21,38 +21,50 @@ union Slot {
 
 ffi_type* argument_ffi_type(ValueType type) {
   switch (type) {
-    case ValueType::integer: return &ffi_type_sint64;
-    case ValueType::double_: return &ffi_type_double;
-    case ValueType::boolean: return &ffi_type_sint8;
-    default: return &ffi_type_pointer;
+    case ValueType::integer:
+      return &ffi_type_sint64;
+    case ValueType::double_:
+      return &ffi_type_double;
+    case ValueType::boolean:
+      return &ffi_type_sint8;
+    default:
+      return &ffi_type_pointer;
   }
 }
 
 ffi_type* result_ffi_type(ValueType type) {
   switch (type) {
-    case ValueType::none: return &ffi_type_void;
-    case ValueType::integer: return &ffi_type_sint64;
-    case ValueType::double_: return &ffi_type_double;
-    case ValueType::boolean: return &ffi_type_uint8;
-    default: return &ffi_type_pointer;
+    case ValueType::none:
+      return &ffi_type_void;
+    case ValueType::integer:
+      return &ffi_type_sint64;
+    case ValueType::double_:
+      return &ffi_type_double;
+    case ValueType::boolean:
+      return &ffi_type_uint8;
+    default:
+      return &ffi_type_pointer;
   }
 }
 
 }  // namespace
 
-DynamicValue call_dynamic(Host& host, std::string_view declaration, const std::vector<DynamicValue>& args) {
+DynamicValue call_dynamic(Host& host, std::string_view declaration,
+                          const std::vector<DynamicValue>& args) {
   void* function = host.find(declaration);
   if (!function) throw std::invalid_argument("not registered: " + std::string(declaration));
   const auto parsed = parse_declaration(declaration);
   if (!parsed) throw std::invalid_argument("cannot parse: " + std::string(declaration));
   if (parsed->params.size() != args.size()) {
-    throw std::invalid_argument(std::string(declaration) + ": takes " + std::to_string(parsed->params.size()) +
-                                " arguments, given " + std::to_string(args.size()));
+    throw std::invalid_argument(std::string(declaration) + ": takes " +
+                                std::to_string(parsed->params.size()) + " arguments, given " +
+                                std::to_string(args.size()));
   }
   for (std::size_t i = 0; i < args.size(); ++i) {
     if (args[i].type != parsed->params[i].type) {
-      throw std::invalid_argument(std::string(declaration) + ": argument " + std::to_string(i + 1) + " is " +
-                                  type_name(parsed->params[i].type) + ", given " + type_name(args[i].type));
+      throw std::invalid_argument(std::string(declaration) + ": argument " + std::to_string(i + 1) +
+                                  " is " + type_name(parsed->params[i].type) + ", given " +
+                                  type_name(args[i].type));
     }
   }
 
@@ -70,7 +82,8 @@ DynamicValue call_dynamic(Host& host, std::string_view declaration, const std::v
     values[i] = &slots[i];
     switch (a.type) {
       case ValueType::string:
-        slots[i].pointer = a.string.null ? nullptr : host.make_string(a.string.bytes, a.string.encoding);
+        slots[i].pointer =
+            a.string.null ? nullptr : host.make_string(a.string.bytes, a.string.encoding);
         handles.push_back(slots[i].pointer);
         break;
       case ValueType::memory_block:
@@ -81,10 +94,17 @@ DynamicValue call_dynamic(Host& host, std::string_view declaration, const std::v
         ptr_bytes[i] = a.block.bytes;
         slots[i].pointer = a.block.null ? nullptr : ptr_bytes[i].data();
         break;
-      case ValueType::integer: slots[i].integer = a.integer; break;
-      case ValueType::double_: slots[i].real = a.real; break;
-      case ValueType::boolean: slots[i].boolean = a.boolean ? 1 : 0; break;
-      default: break;
+      case ValueType::integer:
+        slots[i].integer = a.integer;
+        break;
+      case ValueType::double_:
+        slots[i].real = a.real;
+        break;
+      case ValueType::boolean:
+        slots[i].boolean = a.boolean ? 1 : 0;
+        break;
+      default:
+        break;
     }
   }
 
@@ -123,10 +143,17 @@ DynamicValue call_dynamic(Host& host, std::string_view declaration, const std::v
       if (a) host.release(a);
       break;
     }
-    case ValueType::integer: result.integer = raw.integer; break;
-    case ValueType::double_: result.real = raw.real; break;
-    case ValueType::boolean: result.boolean = (raw.small & 0xFF) != 0; break;
-    default: break;
+    case ValueType::integer:
+      result.integer = raw.integer;
+      break;
+    case ValueType::double_:
+      result.real = raw.real;
+      break;
+    case ValueType::boolean:
+      result.boolean = (raw.small & 0xFF) != 0;
+      break;
+    default:
+      break;
   }
   host.call_finished(handles);
   return result;

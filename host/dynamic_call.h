@@ -32,6 +32,7 @@ struct DynamicValue {
 // the ledger in host.last_ledger_report(), as after Host::call. Throws
 // std::invalid_argument when the declaration is not registered or the
 // arguments do not match its parameter types.
-DynamicValue call_dynamic(Host& host, std::string_view declaration, const std::vector<DynamicValue>& args);
+DynamicValue call_dynamic(Host& host, std::string_view declaration,
+                          const std::vector<DynamicValue>& args);
 
 }  // namespace zul_host

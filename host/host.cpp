@@ -97,13 +97,14 @@ void* Host::find(std::string_view declaration) const {
   return nullptr;
 }
 
-void* Host::checked_function(std::string_view declaration, std::initializer_list<ValueType> arguments,
-                             ValueType result) const {
+void* Host::checked_function(std::string_view declaration,
+                             std::initializer_list<ValueType> arguments, ValueType result) const {
   // Entries of the cache are never erased, so the pointer stays valid.
   const std::pair<void*, Declaration>* entry = nullptr;
   {
     std::lock_guard lock(impl_->mu);
-    if (auto it = impl_->checked.find(std::string(declaration)); it != impl_->checked.end()) entry = &it->second;
+    if (auto it = impl_->checked.find(std::string(declaration)); it != impl_->checked.end())
+      entry = &it->second;
   }
   if (!entry) {
     void* found = find(declaration);
@@ -111,7 +112,8 @@ void* Host::checked_function(std::string_view declaration, std::initializer_list
     auto parsed = parse_declaration(declaration);
     if (!parsed) throw std::invalid_argument("cannot parse: " + std::string(declaration));
     std::lock_guard lock(impl_->mu);
-    entry = &impl_->checked.try_emplace(std::string(declaration), found, std::move(*parsed)).first->second;
+    entry = &impl_->checked.try_emplace(std::string(declaration), found, std::move(*parsed))
+                 .first->second;
   }
   void* function = entry->first;
   const Declaration* parsed = &entry->second;
@@ -124,7 +126,8 @@ void* Host::checked_function(std::string_view declaration, std::initializer_list
     for (ValueType given : arguments) {
       const ValueType want = parsed->params[i].type;
       if (given != want) {
-        why = "argument " + std::to_string(i + 1) + " is " + type_name(want) + ", given " + type_name(given);
+        why = "argument " + std::to_string(i + 1) + " is " + type_name(want) + ", given " +
+              type_name(given);
         break;
       }
       ++i;
@@ -174,7 +177,9 @@ Block Host::read(REALmemoryBlock m) const {
   std::lock_guard lock(impl_->mu);
   const HostObject* o = impl_->check(m, Kind::block, "Host::read");
   if (!o || !o->data) return {{}, true};
-  return {std::string(reinterpret_cast<const char*>(o->data.get()), static_cast<std::size_t>(o->size)), false};
+  return {
+      std::string(reinterpret_cast<const char*>(o->data.get()), static_cast<std::size_t>(o->size)),
+      false};
 }
 
 StrArray Host::read(REALarray a) const {

@@ -13,8 +13,8 @@
 #pragma once
 
 #include <cstdint>
-#include <optional>
 #include <initializer_list>
+#include <optional>
 #include <set>
 #include <span>
 #include <string>
@@ -29,12 +29,12 @@ namespace zul_host {
 using namespace text_encoding;
 
 struct HostConfig {
-  std::optional<double> version = 2019.0;  // nullopt: no "REALGetRBVersion"
-  bool in_runtime = true;                  // answer of "REALinRuntime"
-  std::set<std::string, std::less<>> missing;     // services the resolver never finds
-  std::set<std::string, std::less<>> null_first;  // null on the first look-up, found later
+  std::optional<double> version = 2019.0;              // nullopt: no "REALGetRBVersion"
+  bool in_runtime = true;                              // answer of "REALinRuntime"
+  std::set<std::string, std::less<>> missing;          // services the resolver never finds
+  std::set<std::string, std::less<>> null_first;       // null on the first look-up, found later
   std::set<std::string, std::less<>> unknown_classes;  // "PluginNewInstance" answers null
-  std::int64_t block_cap = std::int64_t{256} << 20;   // bigger memory blocks cannot be made
+  std::int64_t block_cap = std::int64_t{256} << 20;    // bigger memory blocks cannot be made
 };
 
 struct RegisteredMethod {
@@ -47,15 +47,15 @@ struct RegisteredMethod {
 };
 
 struct Registration {
-  std::optional<std::int32_t> announced_version;  // "RegisterPluginVersion"
-  int module_calls = 0;                           // "PluginRegisterModule" calls
-  int method_calls = 0;                           // "PluginRegisterMethod" calls
-  std::string module_name;                        // module path only
-  std::uint32_t module_interface_version = 0;     // module path only
-  std::uint64_t module_method_count = 0;          // module path only
-  bool module_record_zero_elsewhere = false;      // all unset record bytes were zero
+  std::optional<std::int32_t> announced_version;        // "RegisterPluginVersion"
+  int module_calls = 0;                                 // "PluginRegisterModule" calls
+  int method_calls = 0;                                 // "PluginRegisterMethod" calls
+  std::string module_name;                              // module path only
+  std::uint32_t module_interface_version = 0;           // module path only
+  std::uint64_t module_method_count = 0;                // module path only
+  bool module_record_zero_elsewhere = false;            // all unset record bytes were zero
   std::vector<const GlobalMethodEntry*> row_addresses;  // per-method path: pointers passed
-  std::vector<RegisteredMethod> methods;          // every row, in registration order
+  std::vector<RegisteredMethod> methods;                // every row, in registration order
 };
 
 // A host string as tests see it (argument or result).

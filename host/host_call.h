@@ -18,24 +18,39 @@ using plain = std::remove_cvref_t<std::decay_t<A>>;
 template <class A>
 constexpr ValueType argument_type() {
   using T = plain<A>;
-  if constexpr (std::is_same_v<T, Str>) return ValueType::string;
-  else if constexpr (std::is_same_v<T, Block>) return ValueType::memory_block;
-  else if constexpr (std::is_same_v<T, bool>) return ValueType::boolean;
-  else if constexpr (std::is_integral_v<T>) return ValueType::integer;
-  else if constexpr (std::is_floating_point_v<T>) return ValueType::double_;
-  else if constexpr (std::is_pointer_v<T> || std::is_null_pointer_v<T>) return ValueType::ptr;
-  else static_assert(sizeof(T) == 0, "unsupported argument type for Host::call");
+  if constexpr (std::is_same_v<T, Str>)
+    return ValueType::string;
+  else if constexpr (std::is_same_v<T, Block>)
+    return ValueType::memory_block;
+  else if constexpr (std::is_same_v<T, bool>)
+    return ValueType::boolean;
+  else if constexpr (std::is_integral_v<T>)
+    return ValueType::integer;
+  else if constexpr (std::is_floating_point_v<T>)
+    return ValueType::double_;
+  else if constexpr (std::is_pointer_v<T> || std::is_null_pointer_v<T>)
+    return ValueType::ptr;
+  else
+    static_assert(sizeof(T) == 0, "unsupported argument type for Host::call");
 }
 
 template <class R>
 constexpr ValueType result_type() {
-  if constexpr (std::is_same_v<R, Str>) return ValueType::string;
-  else if constexpr (std::is_same_v<R, Block>) return ValueType::memory_block;
-  else if constexpr (std::is_same_v<R, StrArray>) return ValueType::string_array;
-  else if constexpr (std::is_same_v<R, bool>) return ValueType::boolean;
-  else if constexpr (std::is_same_v<R, std::int64_t>) return ValueType::integer;
-  else if constexpr (std::is_same_v<R, double>) return ValueType::double_;
-  else static_assert(sizeof(R) == 0, "Host::call returns Str, Block, StrArray, int64_t, double or bool");
+  if constexpr (std::is_same_v<R, Str>)
+    return ValueType::string;
+  else if constexpr (std::is_same_v<R, Block>)
+    return ValueType::memory_block;
+  else if constexpr (std::is_same_v<R, StrArray>)
+    return ValueType::string_array;
+  else if constexpr (std::is_same_v<R, bool>)
+    return ValueType::boolean;
+  else if constexpr (std::is_same_v<R, std::int64_t>)
+    return ValueType::integer;
+  else if constexpr (std::is_same_v<R, double>)
+    return ValueType::double_;
+  else
+    static_assert(sizeof(R) == 0,
+                  "Host::call returns Str, Block, StrArray, int64_t, double or bool");
 }
 
 // The native type the host passes for an argument of C++ type A.
@@ -44,10 +59,10 @@ using native_argument = std::conditional_t<
     std::is_same_v<plain<A>, Str>, REALstring,
     std::conditional_t<
         std::is_same_v<plain<A>, Block>, REALmemoryBlock,
-        std::conditional_t<
-            std::is_same_v<plain<A>, bool>, signed char,
-            std::conditional_t<std::is_integral_v<plain<A>>, std::int64_t,
-                               std::conditional_t<std::is_floating_point_v<plain<A>>, double, void*>>>>>;
+        std::conditional_t<std::is_same_v<plain<A>, bool>, signed char,
+                           std::conditional_t<std::is_integral_v<plain<A>>, std::int64_t,
+                                              std::conditional_t<std::is_floating_point_v<plain<A>>,
+                                                                 double, void*>>>>>;
 
 template <class R>
 using native_result = std::conditional_t<
@@ -58,7 +73,8 @@ using native_result = std::conditional_t<
 // Makes the host value for one argument; handles made here are recorded so
 // the call can check and release them.
 template <class A, std::size_t N>
-native_argument<A> to_native(Host& host, const A& arg, std::array<const void*, N>& handles, std::size_t& used) {
+native_argument<A> to_native(Host& host, const A& arg, std::array<const void*, N>& handles,
+                             std::size_t& used) {
   using T = plain<A>;
   if constexpr (std::is_same_v<T, Str>) {
     REALstring s = arg.null ? nullptr : host.make_string(arg.bytes, arg.encoding);

@@ -12,9 +12,9 @@
 #include <memory>
 #include <mutex>
 #include <optional>
+#include <set>
 #include <string>
 #include <thread>
-#include <set>
 #include <unordered_map>
 #include <unordered_set>
 #include <vector>
@@ -31,7 +31,7 @@ struct HostObject {
   std::uint64_t id = 0;
   int refs = 1;
   bool destroyed = false;
-  std::thread::id thread;   // the thread that made it (whose ledger owns it)
+  std::thread::id thread;    // the thread that made it (whose ledger owns it)
   const char* made_by = "";  // the service or API that made it
   // string
   std::string bytes;

@@ -38,10 +38,14 @@ std::string preview(std::string_view bytes) {
 
 const char* kind_name(Kind kind) {
   switch (kind) {
-    case Kind::string: return "string";
-    case Kind::block: return "memory block";
-    case Kind::array: return "string array";
-    case Kind::exception: return "exception";
+    case Kind::string:
+      return "string";
+    case Kind::block:
+      return "memory block";
+    case Kind::array:
+      return "string array";
+    case Kind::exception:
+      return "exception";
   }
   return "object";
 }
@@ -66,7 +70,8 @@ HostObject* HostState::make(Kind kind, const char* made_by) {
   return o;
 }
 
-HostObject* HostState::make_string(std::string_view bytes, std::uint32_t encoding, const char* made_by) {
+HostObject* HostState::make_string(std::string_view bytes, std::uint32_t encoding,
+                                   const char* made_by) {
   HostObject* o = make(Kind::string, made_by);
   o->bytes.assign(bytes);
   o->encoding = encoding;
@@ -184,7 +189,7 @@ std::string HostState::report_ledger() {
   std::vector<std::string> lines = t.problems;
   std::vector<const HostObject*> alive;
   for (const auto& [handle, o] : objects) {
-    if (!o->destroyed && o->thread == self && o->id >= t.object_mark ) {
+    if (!o->destroyed && o->thread == self && o->id >= t.object_mark) {
       alive.push_back(o.get());
     }
   }
@@ -197,9 +202,9 @@ std::string HostState::report_ledger() {
   for (std::uint64_t id : open_records) {
     const RecordInfo* r = &records.at(id);
     if (r->thread != self || id < t.record_mark) continue;
-    lines.push_back("string-data record #" + std::to_string(id) + " (" + encoding_label(r->encoding) +
-                    ", " + std::to_string(r->length) + " bytes of string #" +
-                    std::to_string(r->string_id) + ") was never disposed");
+    lines.push_back("string-data record #" + std::to_string(id) + " (" +
+                    encoding_label(r->encoding) + ", " + std::to_string(r->length) +
+                    " bytes of string #" + std::to_string(r->string_id) + ") was never disposed");
   }
   std::string out;
   for (const std::string& line : lines) out += line + "\n";

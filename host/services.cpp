@@ -13,17 +13,18 @@
 namespace zul_host::detail {
 namespace {
 
-
 constexpr const char kLenB[] = "LenB( s as string ) as integer";
 constexpr const char kConstructor[] = "Constructor(bytes as Integer)";
 constexpr const char kToPtr[] = "Operator_Convert() As Ptr";
 
 double get_rb_version() {
-  return serve<double>("REALGetRBVersion", 0.0, [](HostState& h) { return h.config.version.value_or(0.0); });
+  return serve<double>("REALGetRBVersion", 0.0,
+                       [](HostState& h) { return h.config.version.value_or(0.0); });
 }
 
 void register_plugin_version(std::int32_t version) {
-  serve_void("RegisterPluginVersion", [&](HostState& h) { h.registration.announced_version = version; });
+  serve_void("RegisterPluginVersion",
+             [&](HostState& h) { h.registration.announced_version = version; });
 }
 
 bool in_runtime() {
@@ -31,7 +32,11 @@ bool in_runtime() {
 }
 
 RegisteredMethod copy_row(const GlobalMethodEntry& row) {
-  return {row.declaration ? row.declaration : "", row.function, row.setter, row.flags, row.attribute_count,
+  return {row.declaration ? row.declaration : "",
+          row.function,
+          row.setter,
+          row.flags,
+          row.attribute_count,
           row.attributes};
 }
 
@@ -128,7 +133,8 @@ bool get_prop_integer(REALobject o, const char* name, std::int64_t* value) {
 bool set_prop_integer(REALobject o, const char* name, std::int64_t value) {
   return serve<bool>("REALSetPropValueInteger", false, [&](HostState& h) {
     HostObject* x = h.check(o, "REALSetPropValueInteger");
-    if (!x || !name || x->kind != Kind::exception || std::strcmp(name, "ErrorNumber") != 0) return false;
+    if (!x || !name || x->kind != Kind::exception || std::strcmp(name, "ErrorNumber") != 0)
+      return false;
     x->error_number = value;
     return true;
   });
@@ -137,7 +143,8 @@ bool set_prop_integer(REALobject o, const char* name, std::int64_t value) {
 bool set_prop_string(REALobject o, const char* name, REALstring value) {
   return serve<bool>("REALSetPropValueString", false, [&](HostState& h) {
     HostObject* x = h.check(o, "REALSetPropValueString");
-    if (!x || !name || x->kind != Kind::exception || std::strcmp(name, "Message") != 0) return false;
+    if (!x || !name || x->kind != Kind::exception || std::strcmp(name, "Message") != 0)
+      return false;
     HostObject* s = nullptr;
     if (value && !(s = h.check(value, Kind::string, "REALSetPropValueString"))) return false;
     if (s) h.add_ref(s);
@@ -198,7 +205,8 @@ void* load_object_method(REALobject o, const char* declaration) {
   return serve<void*>("REALLoadObjectMethod", nullptr, [&](HostState& h) -> void* {
     HostObject* x = h.check(o, "REALLoadObjectMethod");
     if (!x || x->kind != Kind::block || !declaration) return nullptr;
-    if (std::strcmp(declaration, kConstructor) == 0) return reinterpret_cast<void*>(&block_constructor);
+    if (std::strcmp(declaration, kConstructor) == 0)
+      return reinterpret_cast<void*>(&block_constructor);
     if (std::strcmp(declaration, kToPtr) == 0) return reinterpret_cast<void*>(&block_to_ptr);
     return nullptr;
   });
@@ -212,7 +220,8 @@ REALobject new_instance(const char* class_name) {
   return serve<REALobject>("PluginNewInstance", nullptr, [&](HostState& h) -> REALobject {
     if (!class_name || h.config.unknown_classes.count(class_name)) return nullptr;
     const std::string_view name(class_name);
-    if (name == "MemoryBlock") return reinterpret_cast<REALobject>(h.make(Kind::block, "PluginNewInstance"));
+    if (name == "MemoryBlock")
+      return reinterpret_cast<REALobject>(h.make(Kind::block, "PluginNewInstance"));
     if (!ends_with(name, "Exception")) return nullptr;
     HostObject* e = h.make(Kind::exception, "PluginNewInstance");
     e->class_name.assign(name);
@@ -285,7 +294,8 @@ void* resolve_service(const char* name) {
       {"newMemoryBlock", reinterpret_cast<void*>(&new_memory_block)},
       {"REALLoadObjectMethod", reinterpret_cast<void*>(&load_object_method)},
       {"PluginNewInstance", reinterpret_cast<void*>(&new_instance)},
-      {"PluginCallFunctionWithExceptionHandler", reinterpret_cast<void*>(&call_with_exception_handler)},
+      {"PluginCallFunctionWithExceptionHandler",
+       reinterpret_cast<void*>(&call_with_exception_handler)},
       {"REALSetPropValueString", reinterpret_cast<void*>(&set_prop_string)},
       {"REALSetPropValueInteger", reinterpret_cast<void*>(&set_prop_integer)},
       {"RuntimeRaiseException", reinterpret_cast<void*>(&raise_exception)},

@@ -23,15 +23,24 @@ constexpr bool kLittle = std::endian::native == std::endian::little;
 
 const char* iconv_name(std::uint32_t encoding) {
   switch (encoding) {
-    case kMacRoman: return "MACINTOSH";
-    case kUTF16: return kLittle ? "UTF-16LE" : "UTF-16BE";
-    case kLatin1: return "ISO-8859-1";
-    case kWindowsLatin1: return "CP1252";
-    case kASCII: return "ASCII";
-    case kUTF8: return "UTF-8";
-    case kUTF32: return kLittle ? "UTF-32LE" : "UTF-32BE";
-    case kUnknown: return "ISO-8859-1";
-    default: return nullptr;
+    case kMacRoman:
+      return "MACINTOSH";
+    case kUTF16:
+      return kLittle ? "UTF-16LE" : "UTF-16BE";
+    case kLatin1:
+      return "ISO-8859-1";
+    case kWindowsLatin1:
+      return "CP1252";
+    case kASCII:
+      return "ASCII";
+    case kUTF8:
+      return "UTF-8";
+    case kUTF32:
+      return kLittle ? "UTF-32LE" : "UTF-32BE";
+    case kUnknown:
+      return "ISO-8859-1";
+    default:
+      return nullptr;
   }
 }
 
@@ -64,7 +73,8 @@ class Descriptors {
 
 bool known_encoding(std::uint32_t encoding) { return iconv_name(encoding) != nullptr; }
 
-std::optional<std::string> convert_text(std::string_view bytes, std::uint32_t from, std::uint32_t to) {
+std::optional<std::string> convert_text(std::string_view bytes, std::uint32_t from,
+                                        std::uint32_t to) {
   if (!known_encoding(from) || !known_encoding(to)) return std::nullopt;
   if (from == to) return std::string(bytes);
   if (ascii_compatible(from) && ascii_compatible(to) && all_ascii(bytes)) return std::string(bytes);
@@ -89,21 +99,30 @@ std::optional<std::string> convert_text(std::string_view bytes, std::uint32_t fr
       out_left = out.size() - used;
     }
   }
-  if (iconv(cd, nullptr, nullptr, &at, &out_left) == static_cast<std::size_t>(-1)) return std::nullopt;
+  if (iconv(cd, nullptr, nullptr, &at, &out_left) == static_cast<std::size_t>(-1))
+    return std::nullopt;
   out.resize(out.size() - out_left);
   return out;
 }
 
 std::string encoding_label(std::uint32_t encoding) {
   switch (encoding) {
-    case kMacRoman: return "Mac OS Roman";
-    case kUTF16: return "UTF-16";
-    case kLatin1: return "ISO Latin 1";
-    case kWindowsLatin1: return "Windows Latin 1";
-    case kASCII: return "ASCII";
-    case kUTF8: return "UTF-8";
-    case kUTF32: return "UTF-32";
-    case kUnknown: return "unknown (0xFFFF)";
+    case kMacRoman:
+      return "Mac OS Roman";
+    case kUTF16:
+      return "UTF-16";
+    case kLatin1:
+      return "ISO Latin 1";
+    case kWindowsLatin1:
+      return "Windows Latin 1";
+    case kASCII:
+      return "ASCII";
+    case kUTF8:
+      return "UTF-8";
+    case kUTF32:
+      return "UTF-32";
+    case kUnknown:
+      return "unknown (0xFFFF)";
     default: {
       char text[32];
       std::snprintf(text, sizeof text, "encoding 0x%X", static_cast<unsigned>(encoding));

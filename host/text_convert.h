@@ -15,7 +15,8 @@ namespace zul_host {
 // The bytes of text stored in encoding `from`, re-encoded in `to`; nullopt
 // when a byte sequence does not convert or either encoding is not one of the
 // eight. Converting to the same encoding is a plain copy, whatever the bytes.
-std::optional<std::string> convert_text(std::string_view bytes, std::uint32_t from, std::uint32_t to);
+std::optional<std::string> convert_text(std::string_view bytes, std::uint32_t from,
+                                        std::uint32_t to);
 
 // True for the eight encodings above.
 bool known_encoding(std::uint32_t encoding);

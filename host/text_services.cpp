@@ -22,11 +22,13 @@ REALstring build_string(const void* data, std::int32_t length) {
   });
 }
 
-REALstring build_string_with_encoding(const void* data, std::int32_t length, std::uint32_t encoding) {
+REALstring build_string_with_encoding(const void* data, std::int32_t length,
+                                      std::uint32_t encoding) {
   return serve<REALstring>("REALBuildStringWithEncoding", nullptr, [&](HostState& h) -> REALstring {
     if (length < 0 || (!data && length > 0)) return nullptr;
     const std::string_view bytes(static_cast<const char*>(data), static_cast<std::size_t>(length));
-    return reinterpret_cast<REALstring>(h.make_string(bytes, encoding, "REALBuildStringWithEncoding"));
+    return reinterpret_cast<REALstring>(
+        h.make_string(bytes, encoding, "REALBuildStringWithEncoding"));
   });
 }
 
@@ -37,10 +39,11 @@ void set_string_encoding(REALstring s, std::uint32_t encoding) {
 }
 
 std::uint32_t get_string_encoding(REALstring s) {
-  return serve<std::uint32_t>("REALGetStringEncoding", kUnknown, [&](HostState& h) -> std::uint32_t {
-    HostObject* o = h.check(s, Kind::string, "REALGetStringEncoding");
-    return o ? o->encoding : kUnknown;
-  });
+  return serve<std::uint32_t>("REALGetStringEncoding", kUnknown,
+                              [&](HostState& h) -> std::uint32_t {
+                                HostObject* o = h.check(s, Kind::string, "REALGetStringEncoding");
+                                return o ? o->encoding : kUnknown;
+                              });
 }
 
 REALstring convert_string(REALstring s, std::uint32_t encoding) {
@@ -94,10 +97,12 @@ void dispose_string_data(REALstringData* record) {
     if (reinterpret_cast<std::uintptr_t>(record->host_data[1]) != kRecordMagic) {
       return h.problem("PluginDisposeStringData called with a record the host never filled");
     }
-    const auto id = static_cast<std::uint64_t>(reinterpret_cast<std::uintptr_t>(record->host_data[0]));
+    const auto id =
+        static_cast<std::uint64_t>(reinterpret_cast<std::uintptr_t>(record->host_data[0]));
     auto it = h.records.find(id);
     if (it == h.records.end()) {
-      return h.problem("string-data record #" + std::to_string(id) + " disposed long after it was disposed");
+      return h.problem("string-data record #" + std::to_string(id) +
+                       " disposed long after it was disposed");
     }
     if (it->second.disposed) {
       return h.problem("string-data record #" + std::to_string(id) + " (" +
@@ -115,17 +120,19 @@ void dispose_string_data(REALstringData* record) {
 }
 
 REALarray create_array(std::int32_t element_type, std::int64_t upper_bound) {
-  return serve<REALarray>("RuntimeArrayCreateSingleDimBoundedArray", nullptr, [&](HostState& h) -> REALarray {
-    if (element_type != kStringArrayElementType) {
-      h.problem("RuntimeArrayCreateSingleDimBoundedArray: element type " + std::to_string(element_type) +
-                " is not the string type " + std::to_string(kStringArrayElementType));
-      return nullptr;
-    }
-    if (upper_bound < -1) return nullptr;
-    HostObject* a = h.make(Kind::array, "RuntimeArrayCreateSingleDimBoundedArray");
-    a->items.assign(static_cast<std::size_t>(upper_bound + 1), nullptr);
-    return reinterpret_cast<REALarray>(a);
-  });
+  return serve<REALarray>(
+      "RuntimeArrayCreateSingleDimBoundedArray", nullptr, [&](HostState& h) -> REALarray {
+        if (element_type != kStringArrayElementType) {
+          h.problem("RuntimeArrayCreateSingleDimBoundedArray: element type " +
+                    std::to_string(element_type) + " is not the string type " +
+                    std::to_string(kStringArrayElementType));
+          return nullptr;
+        }
+        if (upper_bound < -1) return nullptr;
+        HostObject* a = h.make(Kind::array, "RuntimeArrayCreateSingleDimBoundedArray");
+        a->items.assign(static_cast<std::size_t>(upper_bound + 1), nullptr);
+        return reinterpret_cast<REALarray>(a);
+      });
 }
 
 std::int64_t array_ubound(REALarray a) {
@@ -140,8 +147,8 @@ void array_insert(REALarray a, std::int64_t index, REALstring s) {
     HostObject* o = h.check(a, Kind::array, "the string array insert function");
     if (!o) return;
     if (index < 0 || index > static_cast<std::int64_t>(o->items.size())) {
-      return h.problem("string array #" + std::to_string(o->id) + ": insert at " + std::to_string(index) +
-                       " outside 0.." + std::to_string(o->items.size()));
+      return h.problem("string array #" + std::to_string(o->id) + ": insert at " +
+                       std::to_string(index) + " outside 0.." + std::to_string(o->items.size()));
     }
     HostObject* item = nullptr;
     if (s && !(item = h.check(s, Kind::string, "the string array insert function"))) return;

@@ -4,8 +4,8 @@
 #include "host/zul_cli.h"
 
 #include <cctype>
-#include <charconv>
 #include <cerrno>
+#include <charconv>
 #include <cstdlib>
 #include <fstream>
 #include <iterator>
@@ -27,8 +27,9 @@ struct Prefix {
   std::uint32_t encoding;
 };
 constexpr Prefix kPrefixes[] = {
-    {"utf8:", kUTF8},        {"utf16:", kUTF16},   {"utf32:", kUTF32}, {"latin1:", kLatin1},
-    {"cp1252:", kWindowsLatin1}, {"macroman:", kMacRoman}, {"ascii:", kASCII},
+    {"utf8:", kUTF8},     {"utf16:", kUTF16},          {"utf32:", kUTF32},
+    {"latin1:", kLatin1}, {"cp1252:", kWindowsLatin1}, {"macroman:", kMacRoman},
+    {"ascii:", kASCII},
 };
 
 bool starts_with(std::string_view s, std::string_view p) { return s.substr(0, p.size()) == p; }
@@ -56,7 +57,9 @@ std::optional<Str> parse_bytes(std::string_view text) {
   if (starts_with(text, "file:")) {
     std::ifstream in(std::string(text.substr(5)), std::ios::binary);
     if (!in) return std::nullopt;
-    return tagged(std::string((std::istreambuf_iterator<char>(in)), std::istreambuf_iterator<char>()), kUnknown);
+    return tagged(
+        std::string((std::istreambuf_iterator<char>(in)), std::istreambuf_iterator<char>()),
+        kUnknown);
   }
   for (const Prefix& p : kPrefixes) {
     if (starts_with(text, p.prefix)) {
@@ -76,7 +79,10 @@ bool printable_utf8(std::string_view s) {
       ++i;
       continue;
     }
-    const int n = c >= 0xC2 && c <= 0xDF ? 1 : c >= 0xE0 && c <= 0xEF ? 2 : c >= 0xF0 && c <= 0xF4 ? 3 : -1;
+    const int n = c >= 0xC2 && c <= 0xDF   ? 1
+                  : c >= 0xE0 && c <= 0xEF ? 2
+                  : c >= 0xF0 && c <= 0xF4 ? 3
+                                           : -1;
     if (n < 0 || i + static_cast<std::size_t>(n) >= s.size()) return false;
     std::uint32_t cp = c & (0x3F >> n);
     for (int k = 1; k <= n; ++k) {
@@ -146,15 +152,19 @@ std::optional<DynamicValue> parse_argument(ValueType type, std::string_view text
       char* end = nullptr;
       errno = 0;
       v.real = std::strtod(copy.c_str(), &end);
-      if (copy.empty() || std::isspace(static_cast<unsigned char>(copy[0])) || *end != '\0') return std::nullopt;
+      if (copy.empty() || std::isspace(static_cast<unsigned char>(copy[0])) || *end != '\0')
+        return std::nullopt;
       return v;
     }
     case ValueType::boolean: {
       std::string l(text);
       for (char& c : l) c = static_cast<char>(std::tolower(static_cast<unsigned char>(c)));
-      if (l == "true" || l == "1") v.boolean = true;
-      else if (l == "false" || l == "0") v.boolean = false;
-      else return std::nullopt;
+      if (l == "true" || l == "1")
+        v.boolean = true;
+      else if (l == "false" || l == "0")
+        v.boolean = false;
+      else
+        return std::nullopt;
       return v;
     }
     default:
@@ -171,12 +181,14 @@ std::optional<std::string> choose_overload(const Registration& registration, std
     for (const RegisteredMethod& m : registration.methods) {
       const auto d = parse_declaration(m.declaration);
       if (!d || d->name != name) continue;
-      if (with_defaults ? d->params.size() <= args.size() : d->params.size() != args.size()) continue;
+      if (with_defaults ? d->params.size() <= args.size() : d->params.size() != args.size())
+        continue;
       std::vector<DynamicValue> parsed;
       for (std::size_t i = 0; i < d->params.size(); ++i) {
         const Parameter& p = d->params[i];
         if (i >= args.size() && !p.default_value) break;
-        auto v = parse_argument(p.type, i < args.size() ? std::string_view(args[i]) : *p.default_value);
+        auto v =
+            parse_argument(p.type, i < args.size() ? std::string_view(args[i]) : *p.default_value);
         if (!v) break;
         parsed.push_back(std::move(*v));
       }
@@ -192,16 +204,20 @@ std::optional<std::string> choose_overload(const Registration& registration, std
 std::string format_value(const DynamicValue& value, bool* as_hex) {
   if (as_hex) *as_hex = false;
   switch (value.type) {
-    case ValueType::string: return format_bytes(value.string.bytes, value.string.encoding, as_hex);
+    case ValueType::string:
+      return format_bytes(value.string.bytes, value.string.encoding, as_hex);
     case ValueType::memory_block:
-    case ValueType::ptr: return format_bytes(value.block.bytes, kUnknown, as_hex);
-    case ValueType::integer: return std::to_string(value.integer);
+    case ValueType::ptr:
+      return format_bytes(value.block.bytes, kUnknown, as_hex);
+    case ValueType::integer:
+      return std::to_string(value.integer);
     case ValueType::double_: {
       char text[64];
       const auto [end, ec] = std::to_chars(text, text + sizeof text, value.real);
       return ec == std::errc() ? std::string(text, end) : "nan";
     }
-    case ValueType::boolean: return value.boolean ? "true" : "false";
+    case ValueType::boolean:
+      return value.boolean ? "true" : "false";
     case ValueType::string_array: {
       std::string out;
       for (const Str& item : value.array.items) {
@@ -210,13 +226,14 @@ std::string format_value(const DynamicValue& value, bool* as_hex) {
       }
       return out;
     }
-    case ValueType::none: return "";
+    case ValueType::none:
+      return "";
   }
   return "";
 }
 
-int run_zul(const std::vector<std::string>& args, const std::string& default_plugin, std::ostream& out,
-            std::ostream& err) {
+int run_zul(const std::vector<std::string>& args, const std::string& default_plugin,
+            std::ostream& out, std::ostream& err) {
   std::string plugin = default_plugin;
   HostConfig config;
   bool verbose = false;
@@ -242,7 +259,8 @@ int run_zul(const std::vector<std::string>& args, const std::string& default_plu
       return 2;
     }
   }
-  if (i >= args.size() || (args[i] != "list" && args[i] != "call") || (args[i] == "call" && i + 1 >= args.size())) {
+  if (i >= args.size() || (args[i] != "list" && args[i] != "call") ||
+      (args[i] == "call" && i + 1 >= args.size())) {
     err << kUsage;
     return 2;
   }
@@ -261,7 +279,8 @@ int run_zul(const std::vector<std::string>& args, const std::string& default_plu
   }
 
   const std::string& name = args[i + 1];
-  const std::vector<std::string> call_args(args.begin() + static_cast<std::ptrdiff_t>(i) + 2, args.end());
+  const std::vector<std::string> call_args(args.begin() + static_cast<std::ptrdiff_t>(i) + 2,
+                                           args.end());
   std::vector<DynamicValue> values;
   const auto declaration = choose_overload(registration, name, call_args, values);
   if (!declaration) {
@@ -295,8 +314,8 @@ int run_zul(const std::vector<std::string>& args, const std::string& default_plu
   out << format_value(result, &as_hex) << "\n";
   const bool has_encoding = result.type == ValueType::string && !result.string.null;
   if (has_encoding && (verbose || as_hex)) {
-    err << "zul: " << (as_hex ? "hex of a string in " : "string in ") << encoding_label(result.string.encoding)
-        << "\n";
+    err << "zul: " << (as_hex ? "hex of a string in " : "string in ")
+        << encoding_label(result.string.encoding) << "\n";
   } else if (result.type == ValueType::string && result.string.null && verbose) {
     err << "zul: the null string\n";
   }

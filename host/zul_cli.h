@@ -47,7 +47,7 @@ std::string format_value(const DynamicValue& value, bool* as_hex = nullptr);
 
 // Runs zul with its arguments (without the program name). default_plugin is
 // used when no --plugin option is given.
-int run_zul(const std::vector<std::string>& args, const std::string& default_plugin, std::ostream& out,
-            std::ostream& err);
+int run_zul(const std::vector<std::string>& args, const std::string& default_plugin,
+            std::ostream& out, std::ostream& err);
 
 }  // namespace zul_host

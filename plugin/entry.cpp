@@ -39,7 +39,8 @@ void register_module() {
   std::snprintf(name, sizeof name, "%s%s", gpartname, kModuleSuffix);
   auto* record = static_cast<ModuleRecord*>(std::calloc(1, sizeof(ModuleRecord)));
   if (!record) return;
-  auto* rows = static_cast<GlobalMethodEntry*>(std::calloc(globalMethodCount, sizeof(GlobalMethodEntry)));
+  auto* rows =
+      static_cast<GlobalMethodEntry*>(std::calloc(globalMethodCount, sizeof(GlobalMethodEntry)));
   if (!rows) {
     std::free(record);
     return;

@@ -11,9 +11,9 @@
 
 // Globals set once by REALPluginMain, read without locks afterwards.
 extern REALResolver gResolver;
-extern double rbversion_rbversion;       // host version, 0.0 when unknown
-extern int CurrentREALControlVersion;    // plug-in interface version, 9..13
-extern const char* gpartname;            // "String"
+extern double rbversion_rbversion;     // host version, 0.0 when unknown
+extern int CurrentREALControlVersion;  // plug-in interface version, 9..13
+extern const char* gpartname;          // "String"
 
 // How a cache treats a failed look-up.
 enum class CacheKind {
@@ -49,7 +49,9 @@ class HostEntryCache {
   }
 
   template <class Fn>
-  Fn as() { return reinterpret_cast<Fn>(get()); }
+  Fn as() {
+    return reinterpret_cast<Fn>(get());
+  }
 
  private:
   const char* name_;
@@ -72,7 +74,8 @@ const std::uint8_t* REALGetStringContents(REALstring s, std::int64_t* length);
 // A host-language global method by declaration ("REALLoadGlobalMethod").
 void* REALLoadFrameworkMethod(const char* declaration);
 REALstring originalREALBuildString(const void* data, std::int32_t length);
-REALstring REALBuildStringWithEncoding(const void* data, std::int32_t length, std::uint32_t encoding);
+REALstring REALBuildStringWithEncoding(const void* data, std::int32_t length,
+                                       std::uint32_t encoding);
 void REALSetStringEncoding(REALstring s, std::uint32_t encoding);
 REALstring REALConvertString(REALstring s, std::uint32_t encoding);
 // The stored encoding of s. *available (when given) tells whether the host

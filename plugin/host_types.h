@@ -23,9 +23,9 @@ using REALResolver = void* (*)(const char* name);
 
 // One row of the method table (48 bytes, handed to the host as is).
 struct GlobalMethodEntry {
-  void* function;          // the native function the host calls
-  void* setter;            // unused: null in every row
-  const char* declaration; // host-language declaration, NUL-terminated
+  void* function;           // the native function the host calls
+  void* setter;             // unused: null in every row
+  const char* declaration;  // host-language declaration, NUL-terminated
   std::uint32_t flags;
   std::uint32_t zero;
   std::uint64_t attribute_count;
@@ -80,37 +80,47 @@ inline constexpr std::int32_t kStringArrayElementType = 3;
 
 // Native signatures of the host services, by lookup name.
 namespace host_sig {
-using GetRBVersion = double (*)();                                   // "REALGetRBVersion"
-using RegisterPluginVersion = void (*)(std::int32_t);                // "RegisterPluginVersion"
-using InRuntime = bool (*)();                                        // "REALinRuntime"
-using RegisterModule = void (*)(ModuleRecord*);                      // "PluginRegisterModule"
-using RegisterMethod = void (*)(GlobalMethodEntry*);                 // "PluginRegisterMethod"
-using LockString = void (*)(REALstring);                             // "REALLockString", "REALUnlockString"
-using StringGetCString = const char* (*)(REALstring);                // "StringGetCString"
-using LoadGlobalMethod = void* (*)(const char* module, const char* declaration);  // "REALLoadGlobalMethod"
-using LenB = std::int64_t (*)(REALstring);                           // "LenB( s as string ) as integer"
-using LockObject = void (*)(REALobject);                             // "REALLockObject", "REALUnlockObject"
-using GetPropValueInteger = bool (*)(REALobject, const char*, std::int64_t*);  // "REALGetPropValueInteger"
-using MemoryBlockGetSize = std::int64_t (*)(REALmemoryBlock);        // "memoryBlockGetSize"
-using MemoryBlockGetPtr = void* (*)(REALmemoryBlock);                // "memoryBlockGetPtr"
-using NewMemoryBlock = REALmemoryBlock (*)(std::int32_t);            // "newMemoryBlock"
+using GetRBVersion = double (*)();                     // "REALGetRBVersion"
+using RegisterPluginVersion = void (*)(std::int32_t);  // "RegisterPluginVersion"
+using InRuntime = bool (*)();                          // "REALinRuntime"
+using RegisterModule = void (*)(ModuleRecord*);        // "PluginRegisterModule"
+using RegisterMethod = void (*)(GlobalMethodEntry*);   // "PluginRegisterMethod"
+using LockString = void (*)(REALstring);               // "REALLockString", "REALUnlockString"
+using StringGetCString = const char* (*)(REALstring);  // "StringGetCString"
+using LoadGlobalMethod = void* (*)(const char* module,
+                                   const char* declaration);  // "REALLoadGlobalMethod"
+using LenB = std::int64_t (*)(REALstring);                    // "LenB( s as string ) as integer"
+using LockObject = void (*)(REALobject);  // "REALLockObject", "REALUnlockObject"
+using GetPropValueInteger = bool (*)(REALobject, const char*,
+                                     std::int64_t*);           // "REALGetPropValueInteger"
+using MemoryBlockGetSize = std::int64_t (*)(REALmemoryBlock);  // "memoryBlockGetSize"
+using MemoryBlockGetPtr = void* (*)(REALmemoryBlock);          // "memoryBlockGetPtr"
+using NewMemoryBlock = REALmemoryBlock (*)(std::int32_t);      // "newMemoryBlock"
 using LoadObjectMethod = void* (*)(REALobject, const char* declaration);  // "REALLoadObjectMethod"
-using MemoryBlockConstructor = void (*)(REALobject, std::int64_t);   // "Constructor(bytes as Integer)"
-using MemoryBlockToPtr = void* (*)(REALobject);                      // "Operator_Convert() As Ptr"
-using NewInstance = REALobject (*)(const char* class_name);          // "PluginNewInstance"
-using CallWithExceptionHandler = REALobject (*)(void (*)(void*), void*);  // "PluginCallFunctionWithExceptionHandler"
-using SetPropValueString = bool (*)(REALobject, const char*, REALstring);  // "REALSetPropValueString"
-using SetPropValueInteger = bool (*)(REALobject, const char*, std::int64_t);  // "REALSetPropValueInteger"
-using RaiseException = void (*)(REALobject);                         // "RuntimeRaiseException"
-using BuildString = REALstring (*)(const void*, std::int32_t);       // "REALBuildString"
-using BuildStringWithEncoding = REALstring (*)(const void*, std::int32_t, std::uint32_t);  // "REALBuildStringWithEncoding"
-using SetStringEncoding = void (*)(REALstring, std::uint32_t);       // "REALSetStringEncoding"
-using ConvertString = REALstring (*)(REALstring, std::uint32_t);     // "REALConvertString"
-using GetStringEncoding = std::uint32_t (*)(REALstring);             // "REALGetStringEncoding"
-using GetStringData = bool (*)(REALstring, std::uint32_t, REALstringData*);  // "PluginGetStringData"
-using DisposeStringData = void (*)(REALstringData*);                 // "PluginDisposeStringData"
-using CreateArray = REALarray (*)(std::int32_t element_type, std::int64_t upper_bound);  // "RuntimeArrayCreateSingleDimBoundedArray"
-using ArrayUBound = std::int64_t (*)(REALarray);                     // "RuntimeUBound"
+using MemoryBlockConstructor = void (*)(REALobject,
+                                        std::int64_t);       // "Constructor(bytes as Integer)"
+using MemoryBlockToPtr = void* (*)(REALobject);              // "Operator_Convert() As Ptr"
+using NewInstance = REALobject (*)(const char* class_name);  // "PluginNewInstance"
+using CallWithExceptionHandler = REALobject (*)(void (*)(void*),
+                                                void*);  // "PluginCallFunctionWithExceptionHandler"
+using SetPropValueString = bool (*)(REALobject, const char*,
+                                    REALstring);  // "REALSetPropValueString"
+using SetPropValueInteger = bool (*)(REALobject, const char*,
+                                     std::int64_t);             // "REALSetPropValueInteger"
+using RaiseException = void (*)(REALobject);                    // "RuntimeRaiseException"
+using BuildString = REALstring (*)(const void*, std::int32_t);  // "REALBuildString"
+using BuildStringWithEncoding = REALstring (*)(const void*, std::int32_t,
+                                               std::uint32_t);    // "REALBuildStringWithEncoding"
+using SetStringEncoding = void (*)(REALstring, std::uint32_t);    // "REALSetStringEncoding"
+using ConvertString = REALstring (*)(REALstring, std::uint32_t);  // "REALConvertString"
+using GetStringEncoding = std::uint32_t (*)(REALstring);          // "REALGetStringEncoding"
+using GetStringData = bool (*)(REALstring, std::uint32_t,
+                               REALstringData*);      // "PluginGetStringData"
+using DisposeStringData = void (*)(REALstringData*);  // "PluginDisposeStringData"
+using CreateArray =
+    REALarray (*)(std::int32_t element_type,
+                  std::int64_t upper_bound);      // "RuntimeArrayCreateSingleDimBoundedArray"
+using ArrayUBound = std::int64_t (*)(REALarray);  // "RuntimeUBound"
 using StringArrayInsert = void (*)(REALarray, std::int64_t index, REALstring);
-using StringArrayInsertProc = StringArrayInsert (*)(REALarray);      // "PluginStringArrayInsertProc"
+using StringArrayInsertProc = StringArrayInsert (*)(REALarray);  // "PluginStringArrayInsertProc"
 }  // namespace host_sig

@@ -22,9 +22,7 @@ class rbData {
   rbData(const rbData&) = delete;
   rbData& operator=(const rbData&) = delete;
 
-  std::span<const std::uint8_t> bytes() const {
-    return {data, static_cast<std::size_t>(length)};
-  }
+  std::span<const std::uint8_t> bytes() const { return {data, static_cast<std::size_t>(length)}; }
   std::string_view view() const {
     return {reinterpret_cast<const char*>(data), static_cast<std::size_t>(length)};
   }

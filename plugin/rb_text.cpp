@@ -61,7 +61,8 @@ rbText::rbText(REALstring s) {
     } else {
       // Bytes without a declared encoding are read as Mac OS Roman: the view
       // swaps in a tagged copy and holds that copy's only reference.
-      REALstring remade = REALBuildUnicodeString(bytes.data, bytes.length, text_encoding::kMacRoman);
+      REALstring remade =
+          REALBuildUnicodeString(bytes.data, bytes.length, text_encoding::kMacRoman);
       REALUnlockString(s);
       string_ = remade;
       if (!remade) {

@@ -24,8 +24,14 @@ class rbText {
   std::int64_t LengthUTF8();
   const char* GetASCII();
   std::int64_t LengthASCII();
-  std::string_view utf8() { const char* p = GetUTF8(); return {p, static_cast<std::size_t>(LengthUTF8())}; }
-  std::string_view ascii() { const char* p = GetASCII(); return {p, static_cast<std::size_t>(LengthASCII())}; }
+  std::string_view utf8() {
+    const char* p = GetUTF8();
+    return {p, static_cast<std::size_t>(LengthUTF8())};
+  }
+  std::string_view ascii() {
+    const char* p = GetASCII();
+    return {p, static_cast<std::size_t>(LengthASCII())};
+  }
 
   // Compute the UTF-16 / UTF-32 forms; read them with utf16() / utf32().
   void ConvertUTF16();

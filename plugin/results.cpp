@@ -104,7 +104,8 @@ REALstring REALBuildUnicodeString(const void* data, std::int64_t length, std::ui
 REALstring REALBuildUnicodeStringUTF16(const void* data, std::int64_t byte_length) {
   // An empty result is always the null string, whatever the path.
   if (!data || byte_length < 1 || byte_length > kMaxStringBytes) return nullptr;
-  if (rbversion_rbversion >= 2012.0) return convert_to_utf8(data, byte_length, text_encoding::kUTF16);
+  if (rbversion_rbversion >= 2012.0)
+    return convert_to_utf8(data, byte_length, text_encoding::kUTF16);
   REALstring tagged = originalREALBuildString(data, static_cast<std::int32_t>(byte_length));
   if (!tagged) return nullptr;
   REALSetStringEncoding(tagged, text_encoding::kUTF16);
@@ -113,8 +114,7 @@ REALstring REALBuildUnicodeStringUTF16(const void* data, std::int64_t byte_lengt
   return converted;
 }
 
-StringArrayBuilder::StringArrayBuilder()
-    : array_(REALCreateArray(kStringArrayElementType, -1)) {}
+StringArrayBuilder::StringArrayBuilder() : array_(REALCreateArray(kStringArrayElementType, -1)) {}
 
 StringArrayBuilder::~StringArrayBuilder() {
   if (array_) REALUnlockObject(array_);
@@ -188,7 +188,8 @@ REALmemoryBlock REALNewMemoryBlock(std::int64_t size, const void* bytes) {
     // Reported below like any block that could not be made.
   }
   char message[200];
-  std::snprintf(message, sizeof message, "Failed to allocate a memoryblock with %lld bytes in size.",
+  std::snprintf(message, sizeof message,
+                "Failed to allocate a memoryblock with %lld bytes in size.",
                 static_cast<long long>(size));
   RaiseException("OutOfMemoryException", message, 0);
   return nullptr;

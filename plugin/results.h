@@ -33,7 +33,9 @@ class StringArrayBuilder {
   // Appends s (ignored when null) and releases the library's reference to it.
   void append(REALstring s);
   // Builds the string from bytes in encoding and appends it.
-  void append(std::string_view bytes, std::uint32_t encoding) { append(build_string(bytes, encoding)); }
+  void append(std::string_view bytes, std::uint32_t encoding) {
+    append(build_string(bytes, encoding));
+  }
   REALarray take();
 
  private:

@@ -6,17 +6,19 @@
 // the plain definition and serve as the reference in tests.
 #include "search/byte_search.h"
 
-#include "search/byte_search_simd.h"
-
 #include <array>
 #include <cstring>
+
+#include "search/byte_search_simd.h"
 
 namespace zul::search {
 namespace {
 
 using table = std::array<bool, 256>;
 
-bool in_range(std::int64_t value, const byte_range& r) { return r.first <= value && value <= r.last; }
+bool in_range(std::int64_t value, const byte_range& r) {
+  return r.first <= value && value <= r.last;
+}
 
 std::int64_t scan(bytes_view target, const table& members, std::size_t from = 0) {
   for (std::size_t i = from; i < target.size(); ++i) {

@@ -11,7 +11,9 @@
 namespace zul::search {
 namespace {
 
-bytes_view b(std::string_view s) { return {reinterpret_cast<const std::uint8_t*>(s.data()), s.size()}; }
+bytes_view b(std::string_view s) {
+  return {reinterpret_cast<const std::uint8_t*>(s.data()), s.size()};
+}
 
 TEST(find_first_of, first_target_byte_in_the_set_wins) {
   struct {

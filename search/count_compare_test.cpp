@@ -11,7 +11,9 @@
 namespace zul::search {
 namespace {
 
-bytes_view b(const std::string& s) { return {reinterpret_cast<const std::uint8_t*>(s.data()), s.size()}; }
+bytes_view b(const std::string& s) {
+  return {reinterpret_cast<const std::uint8_t*>(s.data()), s.size()};
+}
 
 std::string random_string(std::mt19937& rng, std::size_t max_len, std::string_view alphabet) {
   std::string s(rng() % (max_len + 1), 'a');
@@ -24,7 +26,8 @@ TEST(count_occurrences, agrees_with_scalar_on_random_strings) {
   for (int round = 0; round < 4000; ++round) {
     const std::string s = random_string(rng, 40, round % 2 ? "ab" : std::string_view("ab\0c", 4));
     const std::string find = random_string(rng, 4, "ab");
-    ASSERT_EQ(count_occurrences(b(s), b(find)), detail::count_occurrences_scalar(b(s), b(find))) << s << "/" << find;
+    ASSERT_EQ(count_occurrences(b(s), b(find)), detail::count_occurrences_scalar(b(s), b(find)))
+        << s << "/" << find;
   }
 }
 

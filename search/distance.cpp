@@ -26,9 +26,9 @@ std::int64_t edit_distance_rows_as(code_points shorter, code_points longer) {
   const std::size_t n = shorter.size();
   const std::size_t m = longer.size();
   std::unique_ptr<Cell[]> buffer(new Cell[3 * (n + 1)]);
-  Cell* before = buffer.get();      // row i - 2
-  Cell* previous = before + n + 1;  // row i - 1
-  Cell* current = previous + n + 1; // row i
+  Cell* before = buffer.get();       // row i - 2
+  Cell* previous = before + n + 1;   // row i - 1
+  Cell* current = previous + n + 1;  // row i
   for (std::size_t j = 0; j <= n; ++j) previous[j] = static_cast<Cell>(j);
   for (std::size_t i = 1; i <= m; ++i) {
     const std::uint32_t c = longer[i - 1];

@@ -26,7 +26,8 @@ std::int64_t model_edit_distance(const text& a, const text& b) {
     for (std::size_t j = 1; j <= lb; ++j) {
       const std::int64_t cost = a[i - 1] == b[j - 1] ? 0 : 1;
       std::int64_t v = std::min({at(j - 1, i) + 1, at(j, i - 1) + 1, at(j - 1, i - 1) + cost});
-      if (i >= 2 && j >= 2 && a[i - 1] == b[j - 2] && a[i - 2] == b[j - 1]) v = std::min(v, at(j - 2, i - 2) + cost);
+      if (i >= 2 && j >= 2 && a[i - 1] == b[j - 2] && a[i - 2] == b[j - 1])
+        v = std::min(v, at(j - 2, i - 2) + cost);
       at(j, i) = v;
     }
   }

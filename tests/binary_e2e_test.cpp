@@ -74,7 +74,10 @@ TEST_F(Binary, bitwise) {
 
 TEST_F(Binary, concat_create_random) {
   check({
-      {call<Str>(kConcat2, utf8("\xC3\xA9"), tagged("A", kLatin1)), raw("\xC3\xA9" "A"), "bytes"},
+      {call<Str>(kConcat2, utf8("\xC3\xA9"), tagged("A", kLatin1)),
+       raw("\xC3\xA9"
+           "A"),
+       "bytes"},
       {call<Str>(kConcat3, utf8("a"), none, utf8("b")), ascii("ab"), "null counts as empty"},
       {call<Str>(kConcat6, utf8("a"), utf8("b"), utf8(""), utf8("d"), utf8("e"), utf8("f")),
        ascii("abdef"), "six"},
@@ -91,8 +94,8 @@ TEST_F(Binary, concat_create_random) {
   EXPECT_FALSE(raised());
   check({{call<Str>(kCreate, INT64_MAX, utf8("ab")), none, "buffer size overflows"}});
   ASSERT_TRUE(raised());
-  EXPECT_EQ(*raised(), (zul_host::RaisedException{"OutOfMemoryException",
-                                                  "Failed to allocate memory.", 0}));
+  EXPECT_EQ(*raised(),
+            (zul_host::RaisedException{"OutOfMemoryException", "Failed to allocate memory.", 0}));
   const Str text = call<Str>(kRandom, std::int64_t{4000}, true);
   EXPECT_EQ(text.encoding, kASCII);
   ASSERT_EQ(text.bytes.size(), 4000u);
@@ -110,7 +113,10 @@ TEST_F(Binary, hex) {
       {call<Str>(kFromHex, utf8("41 42")), ascii("\x41\x04"), "a space is digit 0, pairs shift"},
       {call<Str>(kFromHex, utf8("4GG4/:@`gf")), ascii("\x40\x04\0\0\x0F"sv), "non-digits count 0"},
       {call<Str>(kFromHex, utf8("FF0")), raw("\xFF"), "odd digit dropped, high byte"},
-      {call<Str>(kFromHex, tagged("4\0" "1\0"sv, kUTF16)), ascii("A"), "read as ASCII text"},
+      {call<Str>(kFromHex, tagged("4\0"
+                                  "1\0"sv,
+                                  kUTF16)),
+       ascii("A"), "read as ASCII text"},
       {call<Str>(kFromHex, utf8("4")), none, "one digit"},
       {call<Str>(kFromHex, call<Str>(kToHex, raw(all))), raw(all), "round trip"},
   });
@@ -130,8 +136,8 @@ TEST_F(Binary, hex_dump) {
       {call<Str>(kDump, raw("\xAB"), k1, k4, e, e, sp, e), ascii("A B 0 0"), "nibble groups"},
       {call<Str>(kDump, utf8("A"), k2, k1, e, utf8("\xC3\xA9"), sp, e), ascii("41\xC3\xA9"),
        "non-ASCII line end, still ASCII"},
-      {call<Str>(kDump, b17, k2, k16, e, lf, e, e), ascii(x16 + "\n79" + std::string(30, '0') + "\n"),
-       "17 bytes: fifteen filler groups"},
+      {call<Str>(kDump, b17, k2, k16, e, lf, e, e),
+       ascii(x16 + "\n79" + std::string(30, '0') + "\n"), "17 bytes: fifteen filler groups"},
       {call<Str>(kDump, abc, k0, k2, e, lf, sp, e), none, "hexlen 0"},
       {call<Str>(kDump, abc, k2, -k2, e, lf, sp, e), none, "negative linelen"},
       {call<Str>(kDump, e, k2, k2, e, lf, sp, e), none, "empty input"},
@@ -151,7 +157,12 @@ TEST_F(Binary, readable_runs_from_every_source) {
       {"Hello\0World"sv, 0, {"Hello", "World"}, "two runs"},
       {"Hello\0World"sv, 5, {}, "both exactly MinLength: empty array"},
       {"  \0\tA\n"sv, -4, {"\tA\n"}, "blank run dropped, not trimmed, negative MinLength"},
-      {"Gr\xC3\xBC\xC3\x9F" "e", 6, {"Gr\xC3\xBC\xC3\x9F" "e"}, "MinLength counts bytes"},
+      {"Gr\xC3\xBC\xC3\x9F"
+       "e",
+       6,
+       {"Gr\xC3\xBC\xC3\x9F"
+        "e"},
+       "MinLength counts bytes"},
       {"A\xC3(B\xED\xA0\x80 \xC0\xAF", 0, {"A", "(B"}, "bad continuation, surrogate, overlong"},
       {"ab\xE2\x82", 0, {"ab"}, "data ends inside a character"},
   };

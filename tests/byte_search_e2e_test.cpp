@@ -1,8 +1,8 @@
 // Byte search end to end: each row calls one registered declaration through
 // the stand-in host with the ledger checked after the call.
 #include <optional>
-#include <thread>
 #include <string>
+#include <thread>
 #include <vector>
 
 #include "tests/host_fixture.h"
@@ -17,10 +17,12 @@ constexpr const char* kBytes = "InStrBytesZUL(target as string, find as string) 
 constexpr const char* kRange1 =
     "InStrByteRangeZUL(target as string, StartValue as integer, EndValue as integer) as integer";
 constexpr const char* kRange2 =
-    "InStrByteRangeZUL(target as string, StartValue as integer, EndValue as integer, StartValue2 as "
+    "InStrByteRangeZUL(target as string, StartValue as integer, EndValue as integer, StartValue2 "
+    "as "
     "integer, EndValue2 as integer) as integer";
 constexpr const char* kRange3 =
-    "InStrByteRangeZUL(target as string, StartValue as integer, EndValue as integer, StartValue2 as "
+    "InStrByteRangeZUL(target as string, StartValue as integer, EndValue as integer, StartValue2 "
+    "as "
     "integer, EndValue2 as integer, StartValue3 as integer, EndValue3 as integer) as integer";
 constexpr const char* kRange1B =
     "InStrByteRangeZUL(target as string, find as string, StartValue as integer, EndValue as "
@@ -48,10 +50,11 @@ TEST_F(ByteSearch, first_of_set) {
       {utf8("abc"), zul_host::null_string(), 0, "null find"},
       {zul_host::null_string(), utf8("a"), 0, "null target"},
       {utf8(""), utf8("a"), 0, "empty target"},
-      {tagged(std::string("a\0b", 3), zul_host::kUnknown), tagged(std::string(1, '\0'), zul_host::kUnknown), 2,
-       "NUL inside a string"},
+      {tagged(std::string("a\0b", 3), zul_host::kUnknown),
+       tagged(std::string(1, '\0'), zul_host::kUnknown), 2, "NUL inside a string"},
       {utf8("caf\xC3\xA9"), tagged("\xE9", zul_host::kLatin1), 0, "bytes as stored, no conversion"},
-      {tagged(std::string("\x00\x41", 2), zul_host::kUTF16), utf8("A"), 2, "UTF-16 bytes as stored"},
+      {tagged(std::string("\x00\x41", 2), zul_host::kUTF16), utf8("A"), 2,
+       "UTF-16 bytes as stored"},
   };
   for (const auto& row : rows) {
     SCOPED_TRACE(row.why);
@@ -66,10 +69,14 @@ TEST_F(ByteSearch, ranges_without_find_read_bytes_unsigned) {
   EXPECT_EQ(call<std::int64_t>(kRange1, c3, std::int64_t{128}, std::int64_t{255}), 1);
   EXPECT_EQ(call<std::int64_t>(kRange1, c3, std::int64_t{-128}, std::int64_t{-1}), 0);
   EXPECT_EQ(call<std::int64_t>(kRange2, utf8("xyz-9"), std::int64_t{48}, std::int64_t{57},
-                               std::int64_t{45}, std::int64_t{45}), 4);
-  EXPECT_EQ(call<std::int64_t>(kRange3, utf8("xyz-9"), std::int64_t{1}, std::int64_t{0},
-                               std::int64_t{2}, std::int64_t{1}, std::int64_t{122}, std::int64_t{122}), 3);
-  EXPECT_EQ(call<std::int64_t>(kRange1, zul_host::null_string(), std::int64_t{0}, std::int64_t{255}), 0);
+                               std::int64_t{45}, std::int64_t{45}),
+            4);
+  EXPECT_EQ(
+      call<std::int64_t>(kRange3, utf8("xyz-9"), std::int64_t{1}, std::int64_t{0}, std::int64_t{2},
+                         std::int64_t{1}, std::int64_t{122}, std::int64_t{122}),
+      3);
+  EXPECT_EQ(
+      call<std::int64_t>(kRange1, zul_host::null_string(), std::int64_t{0}, std::int64_t{255}), 0);
 }
 
 TEST_F(ByteSearch, ranges_with_find_read_bytes_signed) {
@@ -77,14 +84,19 @@ TEST_F(ByteSearch, ranges_with_find_read_bytes_signed) {
   const Str empty = utf8("");
   EXPECT_EQ(call<std::int64_t>(kRange1B, c3, empty, std::int64_t{128}, std::int64_t{255}), 0);
   EXPECT_EQ(call<std::int64_t>(kRange1B, c3, empty, std::int64_t{-128}, std::int64_t{-1}), 1);
-  EXPECT_EQ(call<std::int64_t>(kRange1B, utf8("a-b"), utf8("-"), std::int64_t{48}, std::int64_t{57}), 2);
+  EXPECT_EQ(
+      call<std::int64_t>(kRange1B, utf8("a-b"), utf8("-"), std::int64_t{48}, std::int64_t{57}), 2);
   EXPECT_EQ(call<std::int64_t>(kRange2B, utf8("ab\tc"), utf8("c"), std::int64_t{9}, std::int64_t{9},
-                               std::int64_t{100}, std::int64_t{90}), 3);
+                               std::int64_t{100}, std::int64_t{90}),
+            3);
   EXPECT_EQ(call<std::int64_t>(kRange3B, utf8("abcd"), zul_host::null_string(), std::int64_t{5},
                                std::int64_t{1}, std::int64_t{5}, std::int64_t{1}, std::int64_t{100},
-                               std::int64_t{100}), 4);
-  EXPECT_EQ(call<std::int64_t>(kRange3B, utf8(""), utf8("a"), std::int64_t{0}, std::int64_t{255},
-                               std::int64_t{0}, std::int64_t{255}, std::int64_t{0}, std::int64_t{255}), 0);
+                               std::int64_t{100}),
+            4);
+  EXPECT_EQ(
+      call<std::int64_t>(kRange3B, utf8(""), utf8("a"), std::int64_t{0}, std::int64_t{255},
+                         std::int64_t{0}, std::int64_t{255}, std::int64_t{0}, std::int64_t{255}),
+      0);
 }
 
 // One handle passed as both arguments is locked twice and unlocked twice.

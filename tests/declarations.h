@@ -43,7 +43,8 @@ inline constexpr const char* kDeclarations[] = {
     "DecodingFromURLZUL(s as string, options as integer) as string",
     "EncodingToQuotedPrintableZUL(s as string, LineLen as integer = 72) as string",
     "DecodingFromQuotedPrintableZUL(s as string) as string",
-    "HexstringZUL(input as string, hexlen as integer, linelen as integer, linestart as string, lineend as string, spacer as string,filler as string) as string",
+    "HexstringZUL(input as string, hexlen as integer, linelen as integer, linestart as string, "
+    "lineend as string, spacer as string,filler as string) as string",
     "EncodingToISO8859ZUL(s as string) as string",
     "DecodingFromISO8859ZUL(s as string) as string",
     "EncodingToCP1252ZUL(s as string) as string",
@@ -55,17 +56,25 @@ inline constexpr const char* kDeclarations[] = {
     "IsASCIIStringZUL(s as string, mode as integer) as boolean",
     "RemoveHTMLTagsZUL(AsciiTextWithTags as string) as string",
     "RemoveHTMLTagsWithZUL(AsciiTextWithTags as string, Replacement as string) as string",
-    "ConcatBinaryStringsZUL(a as string, b as string, c as string, d as string, e as string, f as string) as string",
-    "ConcatBinaryStringsZUL(a as string, b as string, c as string, d as string, e as string) as string",
+    "ConcatBinaryStringsZUL(a as string, b as string, c as string, d as string, e as string, f as "
+    "string) as string",
+    "ConcatBinaryStringsZUL(a as string, b as string, c as string, d as string, e as string) as "
+    "string",
     "ConcatBinaryStringsZUL(a as string, b as string, c as string, d as string) as string",
     "ConcatBinaryStringsZUL(a as string, b as string, c as string) as string",
     "ConcatBinaryStringsZUL(a as string, b as string) as string",
     "SQLReplaceBooleanZUL(SQL as string) as string",
     "InStrBytesZUL(target as string, find as string) as integer",
     "InStrByteRangeZUL(target as string, StartValue as integer, EndValue as integer) as integer",
-    "InStrByteRangeZUL(target as string, StartValue as integer, EndValue as integer, StartValue2 as integer, EndValue2 as integer) as integer",
-    "InStrByteRangeZUL(target as string, StartValue as integer, EndValue as integer, StartValue2 as integer, EndValue2 as integer, StartValue3 as integer, EndValue3 as integer) as integer",
-    "InStrByteRangeZUL(target as string, find as string, StartValue as integer, EndValue as integer) as integer",
-    "InStrByteRangeZUL(target as string, find as string, StartValue as integer, EndValue as integer, StartValue2 as integer, EndValue2 as integer) as integer",
-    "InStrByteRangeZUL(target as string, find as string, StartValue as integer, EndValue as integer, StartValue2 as integer, EndValue2 as integer, StartValue3 as integer, EndValue3 as integer) as integer",
+    "InStrByteRangeZUL(target as string, StartValue as integer, EndValue as integer, StartValue2 "
+    "as integer, EndValue2 as integer) as integer",
+    "InStrByteRangeZUL(target as string, StartValue as integer, EndValue as integer, StartValue2 "
+    "as integer, EndValue2 as integer, StartValue3 as integer, EndValue3 as integer) as integer",
+    "InStrByteRangeZUL(target as string, find as string, StartValue as integer, EndValue as "
+    "integer) as integer",
+    "InStrByteRangeZUL(target as string, find as string, StartValue as integer, EndValue as "
+    "integer, StartValue2 as integer, EndValue2 as integer) as integer",
+    "InStrByteRangeZUL(target as string, find as string, StartValue as integer, EndValue as "
+    "integer, StartValue2 as integer, EndValue2 as integer, StartValue3 as integer, EndValue3 as "
+    "integer) as integer",
 };

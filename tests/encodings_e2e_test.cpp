@@ -28,7 +28,8 @@ constexpr const char* kXML = "EncodingToXMLZUL(s as string, options as integer =
 constexpr const char* kUnXML = "DecodingFromXMLZUL(s as string) as string";
 constexpr const char* kHTMLready = "StringIsHTMLreadyZUL(s as string) as boolean";
 constexpr const char* kXMLready = "StringIsXMLreadyZUL(s as string) as boolean";
-constexpr const char* kQP = "EncodingToQuotedPrintableZUL(s as string, LineLen as integer = 72) as string";
+constexpr const char* kQP =
+    "EncodingToQuotedPrintableZUL(s as string, LineLen as integer = 72) as string";
 constexpr const char* kUnQP = "DecodingFromQuotedPrintableZUL(s as string) as string";
 constexpr const char* kSubject = "EncodeEmailSubjectZUL(s as string) as string";
 constexpr const char* kYencS = "_yDecodeStringZUL(data as string) as string";
@@ -38,7 +39,6 @@ constexpr const char* kTagsWith =
     "RemoveHTMLTagsWithZUL(AsciiTextWithTags as string, Replacement as string) as string";
 constexpr const char* kMySQL = "DecodingFromMySQLZUL(s as string) as string";
 constexpr const char* kBoolean = "SQLReplaceBooleanZUL(SQL as string) as string";
-
 
 using Encodings = HostTest;
 
@@ -70,26 +70,48 @@ const call_row kRows[] = {
     {kHTML, tagged("caf\xE9", kLatin1), 1, ascii("caf&eacute;"), "html read as characters"},
     {kHTML, tagged("\x3D\xD8\x00\xDE"sv, kUTF16), 0, ascii("&#128512;"), "html surrogate pair"},
     {kHTML, utf8("a\0<"sv), 0, ascii("a&lt;"), "html: a zero does not end the check"},
-    {kHTML, tagged("a \x01 b", kWindowsLatin1), 0, tagged("a \x01 b", kWindowsLatin1), "html same string"},
+    {kHTML, tagged("a \x01 b", kWindowsLatin1), 0, tagged("a \x01 b", kWindowsLatin1),
+     "html same string"},
     {kHTML, utf8("\xEF\xBB\xBF"), 0, none(), "html byte-order mark only"},
     {kHTML, utf8(""), 0, none(), "html empty"},
     {kXML, utf8("it's"), 0, utf8("it&#39;s"), "xml apostrophe, options 0"},
     {kXML, utf8("it's"), 3, utf8("it&apos;s"), "xml apostrophe, options 3"},
-    {kXML, tagged("\xE9 & \x07", kLatin1), 0, utf8("\xC3\xA9 &amp; "), "xml non-ASCII kept, control dropped"},
+    {kXML, tagged("\xE9 & \x07", kLatin1), 0, utf8("\xC3\xA9 &amp; "),
+     "xml non-ASCII kept, control dropped"},
     {kXML, utf8("\xE6\x97\xA5\x07"), 0, utf8("\xE6\x97\xA5\x07"), "xml same string"},
     {kXML, null_string(), 1, none(), "xml null"},
     {kUnHTML, utf8("&thetasym;&lt;&#x41;&#X41;"), {}, utf8("\xCF\x91<A&#X41;"), "unhtml"},
     {kUnXML, utf8("&thetasym;&lt;&#x41;&#X41;"), {}, utf8("\xCF\x91<A&#X41;"), "unxml is unhtml"},
-    {kUnHTML, tagged("&eacute;\xE9 &amp", kLatin1), {}, utf8("\xC3\xA9\xC3\xA9 &"), "unhtml Latin-1"},
+    {kUnHTML,
+     tagged("&eacute;\xE9 &amp", kLatin1),
+     {},
+     utf8("\xC3\xA9\xC3\xA9 &"),
+     "unhtml Latin-1"},
     {kUnXML, utf8(""), {}, none(), "unxml empty"},
-    {kQP, utf8("Gr\xC3\xBC\xC3\x9F" "e=\t"), 72, ascii("Gr=C3=BC=C3=9Fe=3D\t"), "qp"},
+    {kQP,
+     utf8("Gr\xC3\xBC\xC3\x9F"
+          "e=\t"),
+     72, ascii("Gr=C3=BC=C3=9Fe=3D\t"), "qp"},
     {kQP, utf8("a \r\nb"), 0, ascii("a=20\r\nb=\r\n"), "qp space before a break"},
     {kQP, utf8("ab"), 2, ascii("=\r\na=\r\nb"), "qp line length 2"},
     {kQP, utf8(""), 72, none(), "qp empty"},
-    {kUnQP, utf8("=c3=a9= x\r\nb"), {}, ascii("\xC3\xA9" "b"), "unqp high bytes marked ASCII"},
+    {kUnQP,
+     utf8("=c3=a9= x\r\nb"),
+     {},
+     ascii("\xC3\xA9"
+           "b"),
+     "unqp high bytes marked ASCII"},
     {kUnQP, utf8("=4G"), {}, none(), "unqp nothing written"},
-    {kSubject, tagged("Hi =?_", kWindowsLatin1), {}, tagged("Hi =?_", kWindowsLatin1), "subject same string"},
-    {kSubject, tagged("Caf\xE9?", kLatin1), {}, ascii("=?utf-8?Q?Caf=C3=A9=3F?="), "subject as UTF-8"},
+    {kSubject,
+     tagged("Hi =?_", kWindowsLatin1),
+     {},
+     tagged("Hi =?_", kWindowsLatin1),
+     "subject same string"},
+    {kSubject,
+     tagged("Caf\xE9?", kLatin1),
+     {},
+     ascii("=?utf-8?Q?Caf=C3=A9=3F?="),
+     "subject as UTF-8"},
     {kSubject, utf8("a b_c=d\t"), {}, ascii("=?utf-8?Q?a_b=5Fc=3Dd=09?="), "subject tab encoded"},
     {kSubject, utf8("a\0b\x7F"sv), {}, ascii("=?utf-8?Q?a=00b=7F?="), "subject zero byte"},
     {kSubject, null_string(), {}, none(), "subject null"},
@@ -103,8 +125,16 @@ const call_row kRows[] = {
     {kMySQL, utf8("It\\'s \\\\n\\x\\Z\\"), {}, ascii("It's \\n\\x\x1A\\"), "mysql"},
     {kMySQL, utf8("\xC3\xA9\\0"), {}, unknown("\xC3\xA9\0"sv), "mysql high bytes"},
     {kMySQL, utf8(""), {}, none(), "mysql empty"},
-    {kBoolean, utf8("a = true AND b = FALSE ORDER BY c"), {}, utf8("a = 1 AND b = 0 ORDER BY c"), "sql"},
-    {kBoolean, utf8("a=true 'true' trueish x = TrUe;"), {}, utf8("a=true 'true' trueish x = TrUe;"), "sql kept"},
+    {kBoolean,
+     utf8("a = true AND b = FALSE ORDER BY c"),
+     {},
+     utf8("a = 1 AND b = 0 ORDER BY c"),
+     "sql"},
+    {kBoolean,
+     utf8("a=true 'true' trueish x = TrUe;"),
+     {},
+     utf8("a=true 'true' trueish x = TrUe;"),
+     "sql kept"},
     {kBoolean, tagged("(true, false) \xE9", kLatin1), {}, utf8("(1, 0) \xC3\xA9"), "sql Latin-1"},
     {kBoolean, utf8("\0true x"sv), {}, none(), "sql cut at a zero byte"},
 };
@@ -112,7 +142,8 @@ const call_row kRows[] = {
 TEST_F(Encodings, string_functions) {
   for (const auto& row : kRows) {
     SCOPED_TRACE(row.why);
-    const Str got = row.options ? call<Str>(row.declaration, row.in, *row.options) : call<Str>(row.declaration, row.in);
+    const Str got = row.options ? call<Str>(row.declaration, row.in, *row.options)
+                                : call<Str>(row.declaration, row.in);
     EXPECT_TRUE(same(got, row.want));
   }
 }
@@ -124,13 +155,15 @@ TEST_F(Encodings, round_trips_of_every_byte_past_the_reserves) {
   }
   for (const std::int64_t options : {0, 1, 2}) {
     SCOPED_TRACE(options);
-    EXPECT_TRUE(same(call<Str>(kUnURL2, call<Str>(kURL2, tagged(all, kUnknown), options), options), unknown(all)));
+    EXPECT_TRUE(same(call<Str>(kUnURL2, call<Str>(kURL2, tagged(all, kUnknown), options), options),
+                     unknown(all)));
   }
   std::string no_breaks;
   for (const char c : all) {
     if (c != '\r' && c != '\n') no_breaks += c;
   }
-  EXPECT_TRUE(same(call<Str>(kUnQP, call<Str>(kQP, tagged(no_breaks, kUnknown), std::int64_t{76})), ascii(no_breaks)));
+  EXPECT_TRUE(same(call<Str>(kUnQP, call<Str>(kQP, tagged(no_breaks, kUnknown), std::int64_t{76})),
+                   ascii(no_breaks)));
   std::string text;
   while (text.size() < 70000) text += "Tom & Jerry's <caf\xC3\xA9> \xE2\x82\xAC \xF0\x9F\x98\x80 ";
   EXPECT_TRUE(same(call<Str>(kUnHTML, call<Str>(kHTML, utf8(text), std::int64_t{0})), utf8(text)));
@@ -194,11 +227,12 @@ TEST_F(Encodings, yenc_memory_block_matches_the_string_variant) {
 
 class SmallBlocks : public HostTest {
  protected:
-  SmallBlocks() : HostTest([] {
-    zul_host::HostConfig config;
-    config.block_cap = 4;
-    return config;
-  }()) {}
+  SmallBlocks()
+      : HostTest([] {
+          zul_host::HostConfig config;
+          config.block_cap = 4;
+          return config;
+        }()) {}
 };
 
 TEST_F(SmallBlocks, yenc_memory_block_that_cannot_be_made) {
@@ -215,7 +249,10 @@ TEST_F(Encodings, tags_with_a_replacement) {
   } rows[] = {
       {utf8("a<br>b"), utf8("-"), utf8("a--b"), "once per byte inside"},
       {utf8("a<\xC3\xA9>b"), tagged("*", kASCII), utf8("a**b"), "UTF-8 bytes inside"},
-      {utf8("a<\xC3\xA9>b"), tagged("\xE9", kLatin1), utf8("a\xC3\xA9\xC3\xA9" "b"), "replacement as UTF-8"},
+      {utf8("a<\xC3\xA9>b"), tagged("\xE9", kLatin1),
+       utf8("a\xC3\xA9\xC3\xA9"
+            "b"),
+       "replacement as UTF-8"},
       {utf8("<b>x</b>"), utf8(""), utf8("x"), "empty replacement"},
       {null_string(), utf8("-"), none(), "null"},
   };

@@ -45,7 +45,8 @@ class Frame : public ::testing::Test {
 
   // Builds, reads back and releases one result string.
   Str build(const std::string& bytes, std::uint32_t encoding) {
-    REALstring s = REALBuildUnicodeString(bytes.data(), static_cast<std::int64_t>(bytes.size()), encoding);
+    REALstring s =
+        REALBuildUnicodeString(bytes.data(), static_cast<std::int64_t>(bytes.size()), encoding);
     Str got = host_.read(s);
     if (s) host_.release(s);
     return got;
@@ -70,7 +71,12 @@ TEST_F(Frame, build_string_tags_and_ascii_demotion) {
       {"a\xE9", enc::kASCII, {"a\xE9", enc::kASCII}, "ASCII passed through as given"},
       {"abc", enc::kUTF8, {"abc", enc::kUTF8}, "UTF-8 is never demoted"},
       {"abc", enc::kLatin1, {"abc", enc::kLatin1}, "other encodings unchanged"},
-      {utf16({0xE9, 0x41}), enc::kUTF16, {"\xC3\xA9" "A", enc::kUTF8}, "UTF-16 becomes UTF-8"},
+      {utf16({0xE9, 0x41}),
+       enc::kUTF16,
+       {"\xC3\xA9"
+        "A",
+        enc::kUTF8},
+       "UTF-16 becomes UTF-8"},
       {utf32({0x1F600}), enc::kUTF32, {"\xF0\x9F\x98\x80", enc::kUTF8}, "UTF-32 becomes UTF-8"},
   };
   for (const auto& row : rows) {
@@ -130,12 +136,24 @@ TEST_F(Frame, text_view_forms) {
   } rows[] = {
       {{"Hi", enc::kWindowsLatin1}, "Hi", {'H', 'i'}, true, "ASCII shortcut"},
       {{"", enc::kUTF8}, "", {}, true, "empty string"},
-      {{"A\xE9", enc::kUnknown}, "A\xC3\x88", {'A', 0xC8}, false, "unknown bytes read as Mac OS Roman"},
+      {{"A\xE9", enc::kUnknown},
+       "A\xC3\x88",
+       {'A', 0xC8},
+       false,
+       "unknown bytes read as Mac OS Roman"},
       {{"A\xE9", enc::kLatin1}, "A\xC3\xA9", {'A', 0xE9}, false, "Latin 1"},
       {{"\x80", enc::kWindowsLatin1}, "\xE2\x82\xAC", {0x20AC}, false, "Windows Latin 1 euro"},
-      {{utf16({0xFEFF, 'A'}), enc::kUTF16}, "\xEF\xBB\xBF" "A", {'A'}, false,
+      {{utf16({0xFEFF, 'A'}), enc::kUTF16},
+       "\xEF\xBB\xBF"
+       "A",
+       {'A'},
+       false,
        "the mark stays in UTF-8 but not in UTF-32"},
-      {{"A\xF0\x9F\x98\x80", enc::kUTF8}, "A\xF0\x9F\x98\x80", {'A', 0x1F600}, false, "non-BMP is one unit"},
+      {{"A\xF0\x9F\x98\x80", enc::kUTF8},
+       "A\xF0\x9F\x98\x80",
+       {'A', 0x1F600},
+       false,
+       "non-BMP is one unit"},
   };
   for (const auto& row : rows) {
     SCOPED_TRACE(row.why);
@@ -146,7 +164,8 @@ TEST_F(Frame, text_view_forms) {
       EXPECT_EQ(view.utf8(), row.want_utf8);
       EXPECT_EQ(view.GetUTF8()[view.LengthUTF8()], '\0');
       view.ConvertUTF32();
-      EXPECT_EQ(std::vector<std::uint32_t>(view.utf32().begin(), view.utf32().end()), row.want_utf32);
+      EXPECT_EQ(std::vector<std::uint32_t>(view.utf32().begin(), view.utf32().end()),
+                row.want_utf32);
       EXPECT_EQ(view.utf32().data()[view.utf32().size()], 0u);
     }
     host_.release(s);
@@ -257,8 +276,10 @@ TEST_F(Frame, raise_exception_sets_class_message_and_number) {
     zul_host::RaisedException want;
     const char* why;
   } rows[] = {
-      {"OutOfMemoryException", "Failed to allocate memory.",
-       {"OutOfMemoryException", "Failed to allocate memory.", 0}, "known class"},
+      {"OutOfMemoryException",
+       "Failed to allocate memory.",
+       {"OutOfMemoryException", "Failed to allocate memory.", 0},
+       "known class"},
       {"OutOfBoundsException", "", {"OutOfBoundsException", "", 0}, "empty message"},
       {"OutOfBoundsException", nullptr, {"OutOfBoundsException", "", 0}, "no message"},
       {"NotAClass", "m\xC3\xA9", {"RuntimeException", "m\xC3\xA9", 0}, "unknown class falls back"},

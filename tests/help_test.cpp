@@ -18,7 +18,8 @@
 namespace {
 
 std::string read_help_source() {
-  auto path = std::filesystem::path(__FILE__).parent_path().parent_path() / "plugin" / "method_help.txt";
+  auto path =
+      std::filesystem::path(__FILE__).parent_path().parent_path() / "plugin" / "method_help.txt";
   std::ifstream in(path, std::ios::binary);
   EXPECT_TRUE(in.good()) << path;
   return {std::istreambuf_iterator<char>(in), std::istreambuf_iterator<char>()};
@@ -125,7 +126,8 @@ TEST(help_source, rejects_malformed_entries) {
 TEST(help_source, numbers_overloads_and_keeps_continuations) {
   zul::help::parsed help = zul::help::parse_help(
       "== Fam\n"
-      "@ A(x as integer) as integer\nsummary: one\n  two\nresult: r\nexample: x = A(1)\nexample:   indented\n"
+      "@ A(x as integer) as integer\nsummary: one\n  two\nresult: r\nexample: x = A(1)\nexample:   "
+      "indented\n"
       "@ B() as string\nsummary: s\nresult: r\nexample: b\n"
       "@ A() as integer\nsummary: s\nresult: r\nexample: a\n");
   ASSERT_EQ(help.error, "");

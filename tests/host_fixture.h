@@ -16,7 +16,9 @@
 
 // Wanted results: the null string, or bytes with an encoding.
 inline zul_host::Str none() { return zul_host::null_string(); }
-inline zul_host::Str ascii(std::string_view bytes) { return zul_host::tagged(bytes, zul_host::kASCII); }
+inline zul_host::Str ascii(std::string_view bytes) {
+  return zul_host::tagged(bytes, zul_host::kASCII);
+}
 inline zul_host::Str unknown(std::string_view bytes) {
   return zul_host::tagged(bytes, zul_host::kUnknown);
 }

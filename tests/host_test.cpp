@@ -4,12 +4,13 @@
 // behave as the plug-in expects; and its declaration parser must read every
 // declaration the library registers. Driven through a small fake plug-in and
 // through the resolver directly.
+#include "host/host.h"
+
 #include <gtest/gtest.h>
 
 #include <cstring>
 #include <thread>
 
-#include "host/host.h"
 #include "host/text_convert.h"
 #include "tests/declarations.h"
 
@@ -37,14 +38,17 @@ TEST_F(FakeHost, ledger_names_each_misuse) {
     const char* why;
   } rows[] = {
       {"FakeLeakZUL(s as string) as integer", "string #", "a string made and never released"},
-      {"FakeLeakZUL(s as string) as integer", "made by REALBuildString", "the report names the maker"},
-      {"FakeDoubleUnlockZUL(s as string) as integer", "released once more than it was locked", "argument over-released"},
+      {"FakeLeakZUL(s as string) as integer", "made by REALBuildString",
+       "the report names the maker"},
+      {"FakeDoubleUnlockZUL(s as string) as integer", "released once more than it was locked",
+       "argument over-released"},
       {"FakeKeepRecordZUL(s as string) as integer", "was never disposed", "record kept"},
   };
   for (const auto& row : rows) {
     SCOPED_TRACE(row.why);
     host_.call<std::int64_t>(row.declaration, utf8("abc"));
-    EXPECT_NE(host_.last_ledger_report().find(row.want), std::string::npos) << host_.last_ledger_report();
+    EXPECT_NE(host_.last_ledger_report().find(row.want), std::string::npos)
+        << host_.last_ledger_report();
   }
   host_.call<Str>("FakeEchoZUL(s as string) as string", utf8("abc"));
   EXPECT_EQ(host_.last_ledger_report(), "") << "a balanced call leaves the report empty";
@@ -56,7 +60,8 @@ TEST_F(FakeHost, dispose_twice_and_stale_handles_are_reported) {
   REALstringData record;
   ASSERT_TRUE(service<host_sig::GetStringData>(host_, "PluginGetStringData")(s, kLatin1, &record));
   EXPECT_EQ(record.length, 2u);
-  EXPECT_NE(static_cast<const unsigned char*>(record.data)[2], 0) << "no terminator after the bytes";
+  EXPECT_NE(static_cast<const unsigned char*>(record.data)[2], 0)
+      << "no terminator after the bytes";
   auto dispose = service<host_sig::DisposeStringData>(host_, "PluginDisposeStringData");
   dispose(&record);
   dispose(&record);
@@ -65,22 +70,27 @@ TEST_F(FakeHost, dispose_twice_and_stale_handles_are_reported) {
   unlock(s);  // already destroyed
   const std::string report = host_.ledger_report();
   EXPECT_NE(report.find("disposed twice"), std::string::npos) << report;
-  EXPECT_NE(report.find("used after it was destroyed, by REALUnlockString"), std::string::npos) << report;
+  EXPECT_NE(report.find("used after it was destroyed, by REALUnlockString"), std::string::npos)
+      << report;
   EXPECT_EQ(host_.ref_count(s), 0);
 }
 
 TEST_F(FakeHost, every_type_crosses_the_call) {
   const std::string byte("\x07", 1);
-  EXPECT_EQ(host_.call<double>("FakeSumZUL(a as integer, b as double, c as boolean, p as ptr, m as MemoryBlock) as double",
+  EXPECT_EQ(host_.call<double>("FakeSumZUL(a as integer, b as double, c as boolean, p as ptr, m as "
+                               "MemoryBlock) as double",
                                std::int64_t{40}, 0.5, true, byte.data(), Block{"four", false}),
             40 + 0.5 + 1 + 7 + 4);
   EXPECT_EQ(host_.last_ledger_report(), "");
-  const StrArray parts = host_.call<StrArray>("FakeSplitZUL(s as string) as string()", utf8("zero"));
+  const StrArray parts =
+      host_.call<StrArray>("FakeSplitZUL(s as string) as string()", utf8("zero"));
   ASSERT_EQ(parts.items.size(), 3u);
   EXPECT_EQ(parts.items[0], utf8("zero"));
   EXPECT_EQ(parts.items[2], utf8("two"));
   EXPECT_EQ(host_.last_ledger_report(), "");
-  EXPECT_EQ(host_.call<Block>("FakeBlockZUL(size as integer) as memoryblock", std::int64_t{3}).bytes, "zzz");
+  EXPECT_EQ(
+      host_.call<Block>("FakeBlockZUL(size as integer) as memoryblock", std::int64_t{3}).bytes,
+      "zzz");
   EXPECT_EQ(host_.last_ledger_report(), "");
 }
 
@@ -94,9 +104,12 @@ TEST_F(FakeHost, raised_exception_is_taken_by_the_call) {
 }
 
 TEST_F(FakeHost, call_rejects_mismatched_types) {
-  EXPECT_THROW(host_.call<std::int64_t>("FakeEchoZUL(s as string) as string", utf8("x")), std::invalid_argument);
-  EXPECT_THROW(host_.call<Str>("FakeEchoZUL(s as string) as string", std::int64_t{1}), std::invalid_argument);
-  EXPECT_THROW(host_.call<Str>("NotThere(s as string) as string", utf8("x")), std::invalid_argument);
+  EXPECT_THROW(host_.call<std::int64_t>("FakeEchoZUL(s as string) as string", utf8("x")),
+               std::invalid_argument);
+  EXPECT_THROW(host_.call<Str>("FakeEchoZUL(s as string) as string", std::int64_t{1}),
+               std::invalid_argument);
+  EXPECT_THROW(host_.call<Str>("NotThere(s as string) as string", utf8("x")),
+               std::invalid_argument);
 }
 
 TEST(host_registration, both_paths_and_ownership) {
@@ -141,23 +154,26 @@ TEST(host_services, memory_blocks_and_cap) {
   EXPECT_EQ(new_block(101), nullptr);
   auto new_instance = service<host_sig::NewInstance>(host, "PluginNewInstance");
   auto load_method = service<host_sig::LoadObjectMethod>(host, "REALLoadObjectMethod");
-  auto handler = service<host_sig::CallWithExceptionHandler>(host, "PluginCallFunctionWithExceptionHandler");
+  auto handler =
+      service<host_sig::CallWithExceptionHandler>(host, "PluginCallFunctionWithExceptionHandler");
   auto get_int = service<host_sig::GetPropValueInteger>(host, "REALGetPropValueInteger");
   auto unlock = service<host_sig::LockObject>(host, "REALUnlockObject");
   for (std::int64_t size : {std::int64_t{10}, std::int64_t{1000}}) {
     SCOPED_TRACE(size);
     REALobject block = new_instance("MemoryBlock");
-    auto constructor =
-        reinterpret_cast<host_sig::MemoryBlockConstructor>(load_method(block, "Constructor(bytes as Integer)"));
+    auto constructor = reinterpret_cast<host_sig::MemoryBlockConstructor>(
+        load_method(block, "Constructor(bytes as Integer)"));
     struct Args {
       host_sig::MemoryBlockConstructor constructor;
       REALobject block;
       std::int64_t size;
     } args{constructor, block, size};
-    REALobject raised = handler([](void* p) {
-      auto* a = static_cast<Args*>(p);
-      a->constructor(a->block, a->size);
-    }, &args);
+    REALobject raised = handler(
+        [](void* p) {
+          auto* a = static_cast<Args*>(p);
+          a->constructor(a->block, a->size);
+        },
+        &args);
     std::int64_t got = -1;
     EXPECT_TRUE(get_int(block, "Size", &got));
     EXPECT_EQ(got, size > 100 ? 0 : size);
@@ -187,7 +203,8 @@ TEST(host_services, unknown_classes_and_exception_names) {
 }
 
 TEST(text_convert, round_trips_across_the_eight_encodings) {
-  const std::string text = "A\xC3\xA9\xE2\x82\xAC";  // "Aé€": in every encoding but Latin 1 and ASCII
+  const std::string text =
+      "A\xC3\xA9\xE2\x82\xAC";  // "Aé€": in every encoding but Latin 1 and ASCII
   const std::uint32_t all[] = {kMacRoman, kUTF16, kWindowsLatin1, kUTF8, kUTF32};
   for (std::uint32_t e : all) {
     SCOPED_TRACE(encoding_label(e));
@@ -207,7 +224,10 @@ TEST(text_convert, round_trips_across_the_eight_encodings) {
       {"\xE9", kLatin1, "\xC3\xA9", "ISO Latin 1"},
       {"\xE9", kUnknown, "\xC3\xA9", "no declared encoding reads as Latin 1"},
       {"\xE9", kASCII, std::nullopt, "not ASCII"},
-      {std::string("\xFF\xFE\x41\x00", 4), kUTF16, "\xEF\xBB\xBF" "A", "a byte-order mark is kept as a character"},
+      {std::string("\xFF\xFE\x41\x00", 4), kUTF16,
+       "\xEF\xBB\xBF"
+       "A",
+       "a byte-order mark is kept as a character"},
       {std::string("\x3D\xD8\x00\xDE", 4), kUTF16, "\xF0\x9F\x98\x80", "surrogate pair"},
       {std::string("\x00\xDE", 2), kUTF16, std::nullopt, "lone low surrogate"},
       {"\xC3", kUTF8, "\xC3", "same encoding is a plain copy"},
@@ -245,26 +265,37 @@ TEST(parse_declaration, every_registered_form) {
   } rows[] = {
       {"GetStringsFromDataZUL(data as ptr, size as Integer, MinLength as Integer = 0) as string()",
        Declaration{"GetStringsFromDataZUL",
-                   {{"data", ValueType::ptr, {}}, {"size", ValueType::integer, {}}, {"MinLength", ValueType::integer, "0"}},
+                   {{"data", ValueType::ptr, {}},
+                    {"size", ValueType::integer, {}},
+                    {"MinLength", ValueType::integer, "0"}},
                    ValueType::string_array},
        "array result, default value"},
       {"_yDecodeMemoryZUL(data as memoryblock) as memoryblock",
-       Declaration{"_yDecodeMemoryZUL", {{"data", ValueType::memory_block, {}}}, ValueType::memory_block},
+       Declaration{
+           "_yDecodeMemoryZUL", {{"data", ValueType::memory_block, {}}}, ValueType::memory_block},
        "lower-case memoryblock"},
       {"RandomBytesStringZUL(Length as integer, ASCII as boolean=false) as string",
-       Declaration{"RandomBytesStringZUL", {{"Length", ValueType::integer, {}}, {"ASCII", ValueType::boolean, "false"}},
+       Declaration{"RandomBytesStringZUL",
+                   {{"Length", ValueType::integer, {}}, {"ASCII", ValueType::boolean, "false"}},
                    ValueType::string},
        "no blanks around ="},
       {"StringANDZUL(a as string,b as string) as string",
-       Declaration{"StringANDZUL", {{"a", ValueType::string, {}}, {"b", ValueType::string, {}}}, ValueType::string},
+       Declaration{"StringANDZUL",
+                   {{"a", ValueType::string, {}}, {"b", ValueType::string, {}}},
+                   ValueType::string},
        "no blank after the comma"},
       {"ScientificStrZUL(d as double, digits as integer) as string",
-       Declaration{"ScientificStrZUL", {{"d", ValueType::double_, {}}, {"digits", ValueType::integer, {}}}, ValueType::string},
+       Declaration{"ScientificStrZUL",
+                   {{"d", ValueType::double_, {}}, {"digits", ValueType::integer, {}}},
+                   ValueType::string},
        "double"},
       {"LenB( s as string ) as integer",
-       Declaration{"LenB", {{"s", ValueType::string, {}}}, ValueType::integer}, "blanks inside the parentheses"},
-      {"Operator_Convert() As Ptr", Declaration{"Operator_Convert", {}, ValueType::ptr}, "no parameters, As"},
-      {"Constructor(bytes as Integer)", Declaration{"Constructor", {{"bytes", ValueType::integer, {}}}, ValueType::none},
+       Declaration{"LenB", {{"s", ValueType::string, {}}}, ValueType::integer},
+       "blanks inside the parentheses"},
+      {"Operator_Convert() As Ptr", Declaration{"Operator_Convert", {}, ValueType::ptr},
+       "no parameters, As"},
+      {"Constructor(bytes as Integer)",
+       Declaration{"Constructor", {{"bytes", ValueType::integer, {}}}, ValueType::none},
        "no result"},
       {"F(a as string()) as string", std::nullopt, "array parameter"},
       {"F(a string) as string", std::nullopt, "missing as"},

@@ -29,7 +29,6 @@ constexpr const char* kFromCP = "DecodingFromCP1252ZUL(s as string) as string";
 constexpr const char* kScientific = "ScientificStrZUL(d as double, digits as integer) as string";
 constexpr const char* kStr = "StrZUL(d as double) as string";
 
-
 using TextConvert = HostTest;
 
 TEST_F(TextConvert, string_functions) {
@@ -38,16 +37,33 @@ TEST_F(TextConvert, string_functions) {
     Str in, want;
     const char* why;
   } rows[] = {
-      {kFromCP, unknown("\x80" "A\x81"), utf8("\xE2\x82\xAC" "A\0"sv), "euro, letter, undefined byte"},
-      {kFromCP, tagged("\x93hi\x94", kUTF8), utf8("\xE2\x80\x9Chi\xE2\x80\x9D"), "stored bytes, tag ignored"},
+      {kFromCP,
+       unknown("\x80"
+               "A\x81"),
+       utf8("\xE2\x82\xAC"
+            "A\0"sv),
+       "euro, letter, undefined byte"},
+      {kFromCP, tagged("\x93hi\x94", kUTF8), utf8("\xE2\x80\x9Chi\xE2\x80\x9D"),
+       "stored bytes, tag ignored"},
       {kFromISO, unknown("\x80"), utf8("\xC2\x80"), "C1 control kept"},
       {kFromISO, unknown("caf\xE9"), utf8("caf\xC3\xA9"), "Latin-1 letter"},
       {kFromISO, utf8(""), none(), "decode empty"},
       {kFromCP, null_string(), none(), "decode null"},
       {kToISO, utf8("na\xC3\xAFve"), unknown("na\xEFve"), "Latin-1 letter, no declared encoding"},
-      {kToISO, utf8("a\xE2\x82\xAC" "bc"), ascii("abc"), "euro dropped, all ASCII"},
-      {kToCP, utf8("a\xE2\x82\xAC" "bc"), unknown("a\x80" "bc"), "euro kept"},
-      {kToCP, utf8("a\xC2\x81" "b"), ascii("ab"), "C1 control dropped"},
+      {kToISO,
+       utf8("a\xE2\x82\xAC"
+            "bc"),
+       ascii("abc"), "euro dropped, all ASCII"},
+      {kToCP,
+       utf8("a\xE2\x82\xAC"
+            "bc"),
+       unknown("a\x80"
+               "bc"),
+       "euro kept"},
+      {kToCP,
+       utf8("a\xC2\x81"
+            "b"),
+       ascii("ab"), "C1 control dropped"},
       {kToCP, utf8("a\0b"sv), ascii("a\0b"sv), "U+0000 kept"},
       {kToCP, utf8("\xCE\xB1\xCE\xB2\xCE\xB3"), none(), "nothing encodable"},
       {kToISO, utf8("\xC3\xA9"), unknown("\xE9"), "one character"},
@@ -55,7 +71,10 @@ TEST_F(TextConvert, string_functions) {
       {kToISO, utf8("x\xF0\x9F\x98\x80y"), ascii("xy"), "surrogate pair dropped"},
       {kToCP, tagged("\xE9\x00\x20\x00"sv, kUTF16), unknown("\xE9 "), "from UTF-16"},
       {kToISO, tagged("\xE9", kLatin1), unknown("\xE9"), "from Latin-1"},
-      {kToISO, utf8("\xEF\xBB\xBF" "ab"), ascii("ab"), "byte-order mark not encoded"},
+      {kToISO,
+       utf8("\xEF\xBB\xBF"
+            "ab"),
+       ascii("ab"), "byte-order mark not encoded"},
       {kToISO, utf8(""), none(), "encode empty"},
       {kToCP, null_string(), none(), "encode null"},
       {kUnicode, utf8("\xC3\xA9"), tagged("\xE9\x00"sv, kUTF16), "to UTF-16"},
@@ -91,7 +110,9 @@ TEST_F(TextConvert, detect_markers) {
     std::int64_t want;
     const char* why;
   } rows[] = {
-      {unknown("\xEF\xBB\xBF" "A"), 1, "UTF-8"},
+      {unknown("\xEF\xBB\xBF"
+               "A"),
+       1, "UTF-8"},
       {unknown("\xEF\xBB"), 0, "UTF-8 cut short"},
       {unknown("\xFF\xFE"), 4, "UTF-16 LE"},
       {unknown("\xFF\xFE\x00"sv), 4, "UTF-16 LE, three bytes"},
@@ -128,7 +149,9 @@ TEST_F(TextConvert, get_markers) {
 
 TEST_F(TextConvert, numbers_as_ASCII_strings) {
   EXPECT_TRUE(same(call<Str>(kScientific, 1234.5, std::int64_t{2}), ascii("1.23e+03")));
-  EXPECT_TRUE(same(call<Str>(kScientific, -std::numeric_limits<double>::infinity(), std::int64_t{3}), ascii("-inf")));
+  EXPECT_TRUE(
+      same(call<Str>(kScientific, -std::numeric_limits<double>::infinity(), std::int64_t{3}),
+           ascii("-inf")));
   EXPECT_TRUE(same(call<Str>(kStr, 0.7), ascii("0.70")));
   EXPECT_TRUE(same(call<Str>(kStr, 1000000.1), ascii("1000000.099999999976717")));
   EXPECT_EQ(call<Str>(kScientific, 1.0 / 3, std::int64_t{1000}).bytes.size(), 498u);

@@ -15,7 +15,8 @@ using zul_host::tagged;
 using zul_host::utf8;
 using namespace text_encoding;
 
-constexpr const char* kCheckP = "CheckUTF8ZUL(data as ptr, size as Integer, Placeholder as string) as string";
+constexpr const char* kCheckP =
+    "CheckUTF8ZUL(data as ptr, size as Integer, Placeholder as string) as string";
 constexpr const char* kCheckM = "CheckUTF8ZUL(mem as MemoryBlock, Placeholder as string) as string";
 constexpr const char* kCheckS = "CheckUTF8ZUL(data as string, Placeholder as string) as string";
 constexpr const char* kReplace =
@@ -33,14 +34,19 @@ TEST_F(Text, check_utf8_overloads_agree) {
     const char* why;
   } rows[] = {
       {"caf\xE9", utf8("?"), utf8("caf?"), "Latin-1 byte"},
-      {"caf\xC3\xA9 \xF0\x9F\x98\x80", utf8("?"), utf8("caf\xC3\xA9 \xF0\x9F\x98\x80"), "well-formed kept"},
+      {"caf\xC3\xA9 \xF0\x9F\x98\x80", utf8("?"), utf8("caf\xC3\xA9 \xF0\x9F\x98\x80"),
+       "well-formed kept"},
       {"plain", utf8("?"), utf8("plain"), "ASCII comes back marked UTF-8"},
       {"ab\xE2\x82", utf8("?"), utf8("ab??"), "cut by the end"},
       {"a\xFF", utf16(u"\uFFFD"), utf8("a\xEF\xBF\xBD"), "UTF-16 placeholder inserted as UTF-8"},
-      {"a\xFF" "b", null_string(), utf8("ab"), "null placeholder drops bytes"},
+      {"a\xFF"
+       "b",
+       null_string(), utf8("ab"), "null placeholder drops bytes"},
       {"\xFF\xFE", null_string(), null_string(), "nothing left: null string"},
-      {"a\xFF", tagged(std::string("<\0>", 3), kUTF8), utf8("a<"), "placeholder ends at its zero byte"},
-      {std::string_view("\0\xFF", 2), utf8("?"), tagged(std::string("\0?", 2), kUTF8), "zero byte passes"},
+      {"a\xFF", tagged(std::string("<\0>", 3), kUTF8), utf8("a<"),
+       "placeholder ends at its zero byte"},
+      {std::string_view("\0\xFF", 2), utf8("?"), tagged(std::string("\0?", 2), kUTF8),
+       "zero byte passes"},
   };
   for (const auto& row : rows) {
     SCOPED_TRACE(row.why);
@@ -62,9 +68,12 @@ TEST_F(Text, check_utf8_without_bytes_skips_the_placeholder) {
   EXPECT_TRUE(call<Str>(kCheckS, utf8(""), placeholder).null);
   EXPECT_TRUE(call<Str>(kCheckM, Block{"", true}, placeholder).null);
   EXPECT_TRUE(call<Str>(kCheckM, Block{"", false}, placeholder).null);
-  EXPECT_TRUE(call<Str>(kCheckP, static_cast<const void*>(nullptr), std::int64_t{3}, placeholder).null);
-  EXPECT_TRUE(call<Str>(kCheckP, static_cast<const void*>(text), std::int64_t{0}, placeholder).null);
-  EXPECT_TRUE(call<Str>(kCheckP, static_cast<const void*>(text), std::int64_t{-1}, placeholder).null);
+  EXPECT_TRUE(
+      call<Str>(kCheckP, static_cast<const void*>(nullptr), std::int64_t{3}, placeholder).null);
+  EXPECT_TRUE(
+      call<Str>(kCheckP, static_cast<const void*>(text), std::int64_t{0}, placeholder).null);
+  EXPECT_TRUE(
+      call<Str>(kCheckP, static_cast<const void*>(text), std::int64_t{-1}, placeholder).null);
   EXPECT_EQ(host_.service_calls("PluginGetStringData"), before);
 }
 

@@ -14,7 +14,9 @@
 namespace {
 
 template <class E>
-std::exception_ptr make(E e) { return std::make_exception_ptr(e); }
+std::exception_ptr make(E e) {
+  return std::make_exception_ptr(e);
+}
 
 TEST(map_exception, classes_and_messages_in_order) {
   struct Row {
@@ -43,7 +45,8 @@ TEST(map_exception, classes_and_messages_in_order) {
   const Row rows[] = {
       {make(std::bad_alloc()), "OutOfMemoryException", "Failed to allocate memory.", "allocation"},
       {make(std::range_error("r")), "OutOfBoundsException", "r", "range_error"},
-      {make(std::out_of_range("o")), "OutOfBoundsException", "o", "out_of_range before logic_error"},
+      {make(std::out_of_range("o")), "OutOfBoundsException", "o",
+       "out_of_range before logic_error"},
       {make(std::overflow_error("ov")), "OutOfBoundsException", "ov", "overflow_error"},
       {make(std::underflow_error("un")), "OutOfBoundsException", "un", "underflow_error"},
       {length_error, "RuntimeException", "vector::reserve", "length_error is a logic_error"},

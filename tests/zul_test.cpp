@@ -20,7 +20,8 @@ TEST(parse_argument, forms_by_type) {
     const char* why;
   } rows[] = {
       {ValueType::string, "héllo", utf8("héllo"), "plain text is UTF-8"},
-      {ValueType::string, "hex:C3a9", tagged("\xC3\xA9", kUnknown), "hex bytes, no declared encoding"},
+      {ValueType::string, "hex:C3a9", tagged("\xC3\xA9", kUnknown),
+       "hex bytes, no declared encoding"},
       {ValueType::string, "hex:C3A", std::nullopt, "odd hex digits"},
       {ValueType::string, "hex:ZZ", std::nullopt, "not hex"},
       {ValueType::string, "@null", null_string(), "the null string"},
@@ -28,7 +29,8 @@ TEST(parse_argument, forms_by_type) {
       {ValueType::string, "cp1252:€", tagged("\x80", kWindowsLatin1), "converted to Windows-1252"},
       {ValueType::string, "macroman:È", tagged("\xE9", kMacRoman), "converted to Mac OS Roman"},
       {ValueType::string, "utf16:A", tagged(std::string("A\0", 2), kUTF16), "UTF-16 host order"},
-      {ValueType::string, "utf32:A", tagged(std::string("A\0\0\0", 4), kUTF32), "UTF-32 host order"},
+      {ValueType::string, "utf32:A", tagged(std::string("A\0\0\0", 4), kUTF32),
+       "UTF-32 host order"},
       {ValueType::string, "ascii:é", std::nullopt, "does not convert to ASCII"},
       {ValueType::string, "file:/no/such/file", std::nullopt, "unreadable file"},
       {ValueType::string, "12", utf8("12"), "a string takes anything"},
@@ -47,11 +49,11 @@ TEST(parse_argument, forms_by_type) {
     bool ok;
     double want;
   } scalars[] = {
-      {ValueType::integer, "-42", true, -42}, {ValueType::integer, "+7", true, 7},
-      {ValueType::integer, "4.5", false, 0},  {ValueType::integer, "", false, 0},
-      {ValueType::integer, "12a", false, 0},  {ValueType::double_, "0.25", true, 0.25},
+      {ValueType::integer, "-42", true, -42},  {ValueType::integer, "+7", true, 7},
+      {ValueType::integer, "4.5", false, 0},   {ValueType::integer, "", false, 0},
+      {ValueType::integer, "12a", false, 0},   {ValueType::double_, "0.25", true, 0.25},
       {ValueType::double_, "1e3", true, 1000}, {ValueType::double_, "x", false, 0},
-      {ValueType::boolean, "TRUE", true, 1},  {ValueType::boolean, "0", true, 0},
+      {ValueType::boolean, "TRUE", true, 1},   {ValueType::boolean, "0", true, 0},
       {ValueType::boolean, "yes", false, 0},
   };
   for (const auto& row : scalars) {
@@ -59,7 +61,7 @@ TEST(parse_argument, forms_by_type) {
     const auto got = parse_argument(row.type, row.text);
     ASSERT_EQ(got.has_value(), row.ok);
     if (!got) continue;
-    const double value = row.type == ValueType::integer ? static_cast<double>(got->integer)
+    const double value = row.type == ValueType::integer   ? static_cast<double>(got->integer)
                          : row.type == ValueType::double_ ? got->real
                                                           : (got->boolean ? 1.0 : 0.0);
     EXPECT_EQ(value, row.want);
@@ -110,8 +112,9 @@ TEST(format_value, text_hex_numbers_and_arrays) {
 
 TEST(choose_overload, kinds_counts_and_defaults) {
   Registration r;
-  for (const char* d : {"F(a as integer) as string", "F(a as string) as string",
-                        "G(a as string, n as integer = 3) as string", "G(a as string, b as string) as string"}) {
+  for (const char* d :
+       {"F(a as integer) as string", "F(a as string) as string",
+        "G(a as string, n as integer = 3) as string", "G(a as string, b as string) as string"}) {
     r.methods.push_back({d});
   }
   struct {
@@ -159,7 +162,11 @@ TEST(run_zul, statuses_and_output) {
     const char* why;
   } rows[] = {
       {{"call", "FakeEchoZUL", "hi"}, 0, "hi\n", "", "string result"},
-      {{"call", "FakeSumZUL", "1", "0.5", "true", "hex:02", "abc"}, 0, "7.5\n", "", "every argument type"},
+      {{"call", "FakeSumZUL", "1", "0.5", "true", "hex:02", "abc"},
+       0,
+       "7.5\n",
+       "",
+       "every argument type"},
       {{"call", "FakeSumZUL", "1", "x", "true", "a", "b"}, 2, "", "fit no overload", "bad double"},
       {{"call", "FakeSplitZUL", "@null"}, 0, "one\ntwo\n", "", "array"},
       {{"call", "FakeBlockZUL", "2"}, 0, "zz\n", "", "memory block"},
@@ -170,7 +177,11 @@ TEST(run_zul, statuses_and_output) {
       {{"frobnicate"}, 2, "", "usage", "unknown command"},
       {{"--host-version", "soon", "list"}, 2, "", "--host-version", "bad version"},
       {{"--plugin", "/no/such.so", "list"}, 3, "", "cannot read", "missing plug-in"},
-      {{"--host-version", "none", "call", "FakeEchoZUL", "hex:41"}, 0, "A\n", "", "per-method host"},
+      {{"--host-version", "none", "call", "FakeEchoZUL", "hex:41"},
+       0,
+       "A\n",
+       "",
+       "per-method host"},
   };
   for (const auto& row : rows) {
     SCOPED_TRACE(row.why);

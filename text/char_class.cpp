@@ -15,9 +15,12 @@ constexpr std::uint64_t kHigh = 0x8080808080808080ull;
 
 bool byte_in(std::uint8_t c, byte_class cls) {
   switch (cls) {
-    case byte_class::seven_bit: return c <= 0x7F;
-    case byte_class::printable: return c >= 0x20 && c <= 0x7F;
-    case byte_class::non_control: return c >= 0x20;
+    case byte_class::seven_bit:
+      return c <= 0x7F;
+    case byte_class::printable:
+      return c >= 0x20 && c <= 0x7F;
+    case byte_class::non_control:
+      return c >= 0x20;
   }
   return false;
 }
@@ -26,9 +29,12 @@ bool word_in(std::uint64_t w, byte_class cls) {
   const bool high = (w & kHigh) != 0;
   const bool control = ((w - 0x20 * kOnes) & ~w & kHigh) != 0;
   switch (cls) {
-    case byte_class::seven_bit: return !high;
-    case byte_class::printable: return !high && !control;
-    case byte_class::non_control: return !control;
+    case byte_class::seven_bit:
+      return !high;
+    case byte_class::printable:
+      return !high && !control;
+    case byte_class::non_control:
+      return !control;
   }
   return false;
 }
@@ -37,10 +43,14 @@ bool word_in(std::uint64_t w, byte_class cls) {
 
 std::optional<byte_class> byte_class_for_mode(std::int64_t mode) noexcept {
   switch (mode) {
-    case 0: return byte_class::seven_bit;
-    case 1: return byte_class::printable;
-    case 2: return byte_class::non_control;
-    default: return std::nullopt;
+    case 0:
+      return byte_class::seven_bit;
+    case 1:
+      return byte_class::printable;
+    case 2:
+      return byte_class::non_control;
+    default:
+      return std::nullopt;
   }
 }
 

@@ -12,7 +12,8 @@ namespace zul::text {
 namespace {
 
 TEST(all_bytes_in, word_version_matches_reference_for_every_byte_and_position) {
-  const byte_class classes[] = {byte_class::seven_bit, byte_class::printable, byte_class::non_control};
+  const byte_class classes[] = {byte_class::seven_bit, byte_class::printable,
+                                byte_class::non_control};
   for (std::size_t length = 1; length <= 24; ++length) {
     for (std::size_t at = 0; at < length; ++at) {
       for (int value = 0; value < 256; ++value) {
@@ -20,7 +21,8 @@ TEST(all_bytes_in, word_version_matches_reference_for_every_byte_and_position) {
         s[at] = static_cast<std::uint8_t>(value);
         if (at + 1 < length) s[at + 1] = 0xC3;  // a high neighbour must not hide a control byte
         for (const byte_class cls : classes) {
-          ASSERT_EQ(all_bytes_in(s, cls), detail::all_bytes_in_scalar(s, cls)) << length << " " << at << " " << value;
+          ASSERT_EQ(all_bytes_in(s, cls), detail::all_bytes_in_scalar(s, cls))
+              << length << " " << at << " " << value;
         }
       }
     }
@@ -32,7 +34,8 @@ TEST(replace_non_printable, every_byte) {
   for (int c = 0; c < 256; ++c) all[c] = static_cast<std::uint8_t>(c);
   const std::string out = replace_non_printable(all, '.');
   ASSERT_EQ(out.size(), 256u);
-  for (int c = 0; c < 256; ++c) EXPECT_EQ(out[c], c >= 0x20 && c <= 0x7F ? static_cast<char>(c) : '.') << c;
+  for (int c = 0; c < 256; ++c)
+    EXPECT_EQ(out[c], c >= 0x20 && c <= 0x7F ? static_cast<char>(c) : '.') << c;
 }
 
 }  // namespace

@@ -6,8 +6,8 @@
 // calls, so calls from several threads are independent.
 #include <cstdint>
 
-#include "plugin/host_services.h"
 #include "plugin/exceptions.h"
+#include "plugin/host_services.h"
 #include "plugin/natives.h"
 #include "plugin/rb_data.h"
 #include "plugin/rb_text.h"

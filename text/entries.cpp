@@ -28,8 +28,8 @@ REALstring CheckUTF8(const void* data, int64_t size, REALstring placeholder) {
     rbText ph(placeholder);
     std::string_view text = ph.utf8();
     text = text.substr(0, text.find('\0'));  // the placeholder ends at its first zero byte
-    const std::string out =
-        zul::text::repair_utf8({static_cast<const std::uint8_t*>(data), static_cast<std::size_t>(size)}, text);
+    const std::string out = zul::text::repair_utf8(
+        {static_cast<const std::uint8_t*>(data), static_cast<std::size_t>(size)}, text);
     return build_string(out, kUTF8);
   });
 }
@@ -56,8 +56,8 @@ REALstring ReplaceNonPrintableCharactersZUL(REALstring s, int64_t replace_value)
   try {
     rbData bytes(s);
     if (bytes.empty()) return nullptr;
-    const std::string out =
-        zul::text::replace_non_printable(bytes.bytes(), static_cast<std::uint8_t>(replace_value & 0xFF));
+    const std::string out = zul::text::replace_non_printable(
+        bytes.bytes(), static_cast<std::uint8_t>(replace_value & 0xFF));
     return build_string(out, kASCII);
   } catch (...) {
     return nullptr;

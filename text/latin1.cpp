@@ -80,8 +80,8 @@ int byte_for_unit(const single_byte_charset& set, std::uint16_t unit) noexcept {
   return (it != last && (*it >> 8) == unit) ? static_cast<int>(*it & 0xFF) : -1;
 }
 
-owned_handle decode_single_byte(std::span<const std::uint8_t> bytes,
-                                const single_byte_charset& set, std::size_t limit) noexcept {
+owned_handle decode_single_byte(std::span<const std::uint8_t> bytes, const single_byte_charset& set,
+                                std::size_t limit) noexcept {
   if (bytes.empty() || bytes.size() > std::numeric_limits<std::size_t>::max() / 2) return {};
   owned_handle out(new_handle(2 * bytes.size(), limit));
   if (!out) return {};

@@ -47,7 +47,7 @@ inline constexpr charset_table escapecharsCP1252 = detail::make_cp1252();
 // its table so that encoding costs one lookup per unit instead of a search.
 struct single_byte_charset {
   const charset_table* to_unicode;
-  std::array<std::int16_t, 256> low;  // byte for each unit below 0x100, -1: none
+  std::array<std::int16_t, 256> low;   // byte for each unit below 0x100, -1: none
   std::array<std::uint32_t, 32> high;  // (unit << 8) | byte for units >= 0x100, sorted
   std::size_t high_count;
   bool ascii_identity;  // units below 0x80 encode to themselves
@@ -60,8 +60,7 @@ extern const single_byte_charset kWindows1252;
 // Decodes bytes into native-order UTF-16 units, one per byte, in a handle
 // of exactly 2 * bytes.size() bytes. Returns a null handle for empty input
 // or when a handle of that size (at most limit bytes) cannot be had.
-owned_handle decode_single_byte(std::span<const std::uint8_t> bytes,
-                                const single_byte_charset& set,
+owned_handle decode_single_byte(std::span<const std::uint8_t> bytes, const single_byte_charset& set,
                                 std::size_t limit = kHandleLimit) noexcept;
 
 // Encodes UTF-16 units, one byte per unit that the set holds, in a handle

@@ -59,8 +59,8 @@ TEST(byte_for_unit, agrees_with_the_table_search_for_every_unit) {
 TEST(encode_single_byte, fast_path_matches_scalar_on_random_texts) {
   // Mostly ASCII with Latin-1, C1, Windows-1252 punctuation, Greek and
   // surrogate halves mixed in, so that word runs start and stop anywhere.
-  const std::uint16_t pool[] = {'a', 'Z', '0', ' ', 0x00, 0x7F, 0x80, 0x81, 0x9F, 0xE9,
-                                0xFF, 0x20AC, 0x2122, 0x0178, 0x03B1, 0xD83D, 0xDE00, 0xFFFF};
+  const std::uint16_t pool[] = {'a',  'Z',  '0',    ' ',    0x00,   0x7F,   0x80,   0x81,   0x9F,
+                                0xE9, 0xFF, 0x20AC, 0x2122, 0x0178, 0x03B1, 0xD83D, 0xDE00, 0xFFFF};
   std::mt19937 random(1);
   std::vector<std::uint16_t> text(80);
   for (int round = 0; round < 3000; ++round) {

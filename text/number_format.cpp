@@ -77,7 +77,8 @@ void expand(double magnitude, exact_decimal& out) noexcept {
   char* p = out.digits.data();
   char top[10];
   int top_len = 0;
-  for (std::uint32_t v = limbs[n - 1]; v != 0; v /= 10) top[top_len++] = static_cast<char>('0' + v % 10);
+  for (std::uint32_t v = limbs[n - 1]; v != 0; v /= 10)
+    top[top_len++] = static_cast<char>('0' + v % 10);
   while (top_len > 0) *p++ = top[--top_len];
   for (int i = n - 2; i >= 0; --i) {
     std::uint32_t v = limbs[i];
@@ -214,8 +215,8 @@ number_text format_plain(double d) noexcept {
   while (len >= 4 && f[len - 1] == '0' && f[len - 2] == '0') --len;
 
   const std::size_t point = f.find('.');
-  const auto k = static_cast<std::size_t>(
-      std::count_if(f.begin(), f.begin() + static_cast<std::ptrdiff_t>(point), [](char c) { return c != '0'; }));
+  const auto k = static_cast<std::size_t>(std::count_if(
+      f.begin(), f.begin() + static_cast<std::ptrdiff_t>(point), [](char c) { return c != '0'; }));
   std::size_t next;  // position in f of the first digit after the kept text
   if (k > 14) {
     len = point;

@@ -30,16 +30,17 @@ std::string c_library(const char* format, int precision, double d, std::size_t s
 // Random finite doubles over the whole exponent range, plus values where
 // rounding is a tie or a carry.
 std::vector<double> sample_doubles() {
-  std::vector<double> values = {0.0,   -0.0,   0.5,      1.5,     2.5,      0.125,    1e23,
-                                9.5,   0.05,   999.9995, 1e-320,  DBL_MAX,  -DBL_MAX, DBL_MIN,
-                                5e-324, 1.0 / 3, 0.1,    99.99,   1234.5,   -9.999999, 0x1p-100};
+  std::vector<double> values = {0.0,    -0.0,    0.5,      1.5,    2.5,     0.125,     1e23,
+                                9.5,    0.05,    999.9995, 1e-320, DBL_MAX, -DBL_MAX,  DBL_MIN,
+                                5e-324, 1.0 / 3, 0.1,      99.99,  1234.5,  -9.999999, 0x1p-100};
   std::mt19937_64 random(42);
   while (values.size() < 3000) {
     const double d = std::bit_cast<double>(random());
     if (std::isfinite(d)) values.push_back(d);
   }
   for (int i = 0; i < 1000; ++i) {  // everyday magnitudes too
-    values.push_back(std::ldexp(static_cast<double>(random() >> 11), -static_cast<int>(random() % 80)));
+    values.push_back(
+        std::ldexp(static_cast<double>(random() >> 11), -static_cast<int>(random() % 80)));
   }
   return values;
 }

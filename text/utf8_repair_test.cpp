@@ -13,7 +13,9 @@
 namespace zul::text {
 namespace {
 
-bytes_view b(std::string_view s) { return {reinterpret_cast<const std::uint8_t*>(s.data()), s.size()}; }
+bytes_view b(std::string_view s) {
+  return {reinterpret_cast<const std::uint8_t*>(s.data()), s.size()};
+}
 
 TEST(repair_utf8, table_boundaries) {
   struct {
@@ -29,7 +31,9 @@ TEST(repair_utf8, table_boundaries) {
       {"\xF0\x90\x80\x80\xF0\x8F\xBF\xBF", "\xF0\x90\x80\x80????", "F0 needs 90..BF"},
       {"\xF4\x8F\xBF\xBF\xF4\x90\x80\x80", "\xF4\x8F\xBF\xBF????", "U+10FFFF, then above it"},
       {"\xF3\xBF\xBF\xC0\xF5\xFF\x80", "???????", "fourth byte above BF; F5..FF, lone 80"},
-      {"\xE2\x82" "A\xE2\xE2\x82\xAC", "??A?\xE2\x82\xAC", "one placeholder per byte, next judged afresh"},
+      {"\xE2\x82"
+       "A\xE2\xE2\x82\xAC",
+       "??A?\xE2\x82\xAC", "one placeholder per byte, next judged afresh"},
       {"x\xC3", "x?", "cut by the end after one byte"},
       {"x\xE2\x82", "x??", "cut after two bytes"},
       {"x\xF0\x9F\x98", "x???", "cut after three bytes"},
@@ -62,9 +66,10 @@ TEST(well_formed_length, every_first_and_second_byte_against_model) {
   for (int first = 0; first < 256; ++first) {
     for (int second = 0; second < 256; ++second) {
       for (std::size_t n = 1; n <= 4; ++n) {
-        const std::uint8_t s[4] = {static_cast<std::uint8_t>(first), static_cast<std::uint8_t>(second), 0x80,
-                                   0xBF};
-        ASSERT_EQ(well_formed_length({s, n}), model_length(s, n)) << first << " " << second << " " << n;
+        const std::uint8_t s[4] = {static_cast<std::uint8_t>(first),
+                                   static_cast<std::uint8_t>(second), 0x80, 0xBF};
+        ASSERT_EQ(well_formed_length({s, n}), model_length(s, n))
+            << first << " " << second << " " << n;
       }
     }
   }
@@ -72,8 +77,17 @@ TEST(well_formed_length, every_first_and_second_byte_against_model) {
 
 TEST(repair_utf8, prefix_skip_matches_reference_on_random_data) {
   std::mt19937 rng(3);
-  const std::string_view pieces[] = {"a", "bcdefgh", "\xC3\xA9", "\xE2\x82\xAC", "\xF0\x9F\x98\x80",
-                                     "\xED\xA0\x80", "\xC0", "\x80", "\xF4\x90", "\xE2\x82", "\xFF",
+  const std::string_view pieces[] = {"a",
+                                     "bcdefgh",
+                                     "\xC3\xA9",
+                                     "\xE2\x82\xAC",
+                                     "\xF0\x9F\x98\x80",
+                                     "\xED\xA0\x80",
+                                     "\xC0",
+                                     "\x80",
+                                     "\xF4\x90",
+                                     "\xE2\x82",
+                                     "\xFF",
                                      std::string_view("\0", 1)};
   for (int round = 0; round < 5000; ++round) {
     std::string in;

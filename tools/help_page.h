@@ -29,8 +29,10 @@ struct parsed {
 namespace detail {
 
 inline std::string_view trim(std::string_view s) {
-  while (!s.empty() && (s.front() == ' ' || s.front() == '\t' || s.front() == '\r')) s.remove_prefix(1);
-  while (!s.empty() && (s.back() == ' ' || s.back() == '\t' || s.back() == '\r')) s.remove_suffix(1);
+  while (!s.empty() && (s.front() == ' ' || s.front() == '\t' || s.front() == '\r'))
+    s.remove_prefix(1);
+  while (!s.empty() && (s.back() == ' ' || s.back() == '\t' || s.back() == '\r'))
+    s.remove_suffix(1);
   return s;
 }
 
@@ -78,7 +80,8 @@ inline parsed parse_help(std::string_view source) {
     }
     if (line.starts_with("@ ")) {
       if (family.empty()) return fail("entry before any \"== \" family");
-      out.entries.push_back({family, std::string(detail::trim(line.substr(2))), {}, {}, {}, {}, {}, {}});
+      out.entries.push_back(
+          {family, std::string(detail::trim(line.substr(2))), {}, {}, {}, {}, {}, {}});
       last = nullptr;
       continue;
     }
@@ -93,8 +96,8 @@ inline parsed parse_help(std::string_view source) {
       last = nullptr;
       continue;
     }
-    std::string* field = key == "summary" ? &e.summary
-                         : key == "args"  ? &e.arguments
+    std::string* field = key == "summary"  ? &e.summary
+                         : key == "args"   ? &e.arguments
                          : key == "result" ? &e.result
                          : key == "raises" ? &e.raises
                                            : nullptr;
@@ -120,11 +123,20 @@ inline std::string escape_html(std::string_view text) {
   out.reserve(text.size() + text.size() / 8);
   for (char c : text) {
     switch (c) {
-      case '&': out += "&amp;"; break;
-      case '<': out += "&lt;"; break;
-      case '>': out += "&gt;"; break;
-      case '"': out += "&quot;"; break;
-      default: out += c;
+      case '&':
+        out += "&amp;";
+        break;
+      case '<':
+        out += "&lt;";
+        break;
+      case '>':
+        out += "&gt;";
+        break;
+      case '"':
+        out += "&quot;";
+        break;
+      default:
+        out += c;
     }
   }
   return out;
@@ -160,14 +172,17 @@ when the result itself cannot be built.</p>
 <h2>Contents</h2>
 )";
   std::string current;
-  auto close_list = [&] { if (!current.empty()) html += "</ul>\n"; };
+  auto close_list = [&] {
+    if (!current.empty()) html += "</ul>\n";
+  };
   for (const entry& e : entries) {
     if (e.family != current) {
       close_list();
       current = e.family;
       html += "<h3>" + escape_html(current) + "</h3>\n<ul>\n";
     }
-    html += "<li><a href=\"#" + e.anchor + "\"><code>" + escape_html(e.declaration) + "</code></a></li>\n";
+    html += "<li><a href=\"#" + e.anchor + "\"><code>" + escape_html(e.declaration) +
+            "</code></a></li>\n";
   }
   close_list();
   html += "</nav>\n";
@@ -181,9 +196,11 @@ when the result itself cannot be built.</p>
     html += "<h3>" + escape_html(detail::method_name(e.declaration)) + "</h3>\n";
     html += "<pre class=\"decl\">" + escape_html(e.declaration) + "</pre>\n";
     html += "<p>" + escape_html(e.summary) + "</p>\n<dl>\n";
-    if (!e.arguments.empty()) html += "<dt>Arguments</dt><dd>" + escape_html(e.arguments) + "</dd>\n";
+    if (!e.arguments.empty())
+      html += "<dt>Arguments</dt><dd>" + escape_html(e.arguments) + "</dd>\n";
     html += "<dt>Result</dt><dd>" + escape_html(e.result) + "</dd>\n";
-    html += "<dt>Exceptions</dt><dd>" + escape_html(e.raises.empty() ? "None." : e.raises) + "</dd>\n";
+    html +=
+        "<dt>Exceptions</dt><dd>" + escape_html(e.raises.empty() ? "None." : e.raises) + "</dd>\n";
     html += "</dl>\n<pre class=\"example\">";
     for (const std::string& line : e.example) html += escape_html(line) + "\n";
     html += "</pre>\n<p><a href=\"#contents\">Contents</a></p>\n</section>\n";

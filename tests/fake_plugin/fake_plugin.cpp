@@ -24,7 +24,8 @@ REALstring echo(REALstring s) {
 }
 
 REALstring make(const char* text) {
-  REALstring s = service<host_sig::BuildString>("REALBuildString")(text, static_cast<std::int32_t>(std::strlen(text)));
+  REALstring s = service<host_sig::BuildString>("REALBuildString")(
+      text, static_cast<std::int32_t>(std::strlen(text)));
   service<host_sig::SetStringEncoding>("REALSetStringEncoding")(s, text_encoding::kUTF8);
   return s;
 }
@@ -41,7 +42,9 @@ std::int64_t double_unlock(REALstring s) {
 
 std::int64_t keep_record(REALstring s) {
   REALstringData record;
-  return service<host_sig::GetStringData>("PluginGetStringData")(s, text_encoding::kUTF8, &record) ? 3 : 0;
+  return service<host_sig::GetStringData>("PluginGetStringData")(s, text_encoding::kUTF8, &record)
+             ? 3
+             : 0;
 }
 
 bool raise(REALstring message) {
@@ -57,12 +60,14 @@ bool raise(REALstring message) {
 double sum(std::int64_t a, double b, signed char c, void* p, REALmemoryBlock m) {
   double total = static_cast<double>(a) + b + (c ? 1 : 0);
   if (p) total += *static_cast<unsigned char*>(p);
-  if (m) total += static_cast<double>(service<host_sig::MemoryBlockGetSize>("memoryBlockGetSize")(m));
+  if (m)
+    total += static_cast<double>(service<host_sig::MemoryBlockGetSize>("memoryBlockGetSize")(m));
   return total;
 }
 
 REALarray split(REALstring s) {
-  REALarray a = service<host_sig::CreateArray>("RuntimeArrayCreateSingleDimBoundedArray")(kStringArrayElementType, -1);
+  REALarray a = service<host_sig::CreateArray>("RuntimeArrayCreateSingleDimBoundedArray")(
+      kStringArrayElementType, -1);
   auto insert = service<host_sig::StringArrayInsertProc>("PluginStringArrayInsertProc")(a);
   for (const char* part : {"one", "two"}) {
     REALstring item = make(part);
@@ -79,20 +84,30 @@ REALarray split(REALstring s) {
 
 REALmemoryBlock block(std::int64_t size) {
   auto m = service<host_sig::NewMemoryBlock>("newMemoryBlock")(static_cast<std::int32_t>(size));
-  if (m) std::memset(service<host_sig::MemoryBlockGetPtr>("memoryBlockGetPtr")(m), 'z', static_cast<std::size_t>(size));
+  if (m)
+    std::memset(service<host_sig::MemoryBlockGetPtr>("memoryBlockGetPtr")(m), 'z',
+                static_cast<std::size_t>(size));
   return m;
 }
 
 GlobalMethodEntry rows[] = {
-    {reinterpret_cast<void*>(&echo), nullptr, "FakeEchoZUL(s as string) as string", 4, 0, 0, nullptr},
-    {reinterpret_cast<void*>(&leak), nullptr, "FakeLeakZUL(s as string) as integer", 4, 0, 0, nullptr},
-    {reinterpret_cast<void*>(&double_unlock), nullptr, "FakeDoubleUnlockZUL(s as string) as integer", 4, 0, 0, nullptr},
-    {reinterpret_cast<void*>(&keep_record), nullptr, "FakeKeepRecordZUL(s as string) as integer", 4, 0, 0, nullptr},
-    {reinterpret_cast<void*>(&raise), nullptr, "FakeRaiseZUL(message as string) as boolean", 4, 0, 0, nullptr},
+    {reinterpret_cast<void*>(&echo), nullptr, "FakeEchoZUL(s as string) as string", 4, 0, 0,
+     nullptr},
+    {reinterpret_cast<void*>(&leak), nullptr, "FakeLeakZUL(s as string) as integer", 4, 0, 0,
+     nullptr},
+    {reinterpret_cast<void*>(&double_unlock), nullptr,
+     "FakeDoubleUnlockZUL(s as string) as integer", 4, 0, 0, nullptr},
+    {reinterpret_cast<void*>(&keep_record), nullptr, "FakeKeepRecordZUL(s as string) as integer", 4,
+     0, 0, nullptr},
+    {reinterpret_cast<void*>(&raise), nullptr, "FakeRaiseZUL(message as string) as boolean", 4, 0,
+     0, nullptr},
     {reinterpret_cast<void*>(&sum), nullptr,
-     "FakeSumZUL(a as integer, b as double, c as boolean, p as ptr, m as MemoryBlock) as double", 4, 0, 0, nullptr},
-    {reinterpret_cast<void*>(&split), nullptr, "FakeSplitZUL(s as string) as string()", 4, 0, 0, nullptr},
-    {reinterpret_cast<void*>(&block), nullptr, "FakeBlockZUL(size as integer) as memoryblock", 4, 0, 0, nullptr},
+     "FakeSumZUL(a as integer, b as double, c as boolean, p as ptr, m as MemoryBlock) as double", 4,
+     0, 0, nullptr},
+    {reinterpret_cast<void*>(&split), nullptr, "FakeSplitZUL(s as string) as string()", 4, 0, 0,
+     nullptr},
+    {reinterpret_cast<void*>(&block), nullptr, "FakeBlockZUL(size as integer) as memoryblock", 4, 0,
+     0, nullptr},
 };
 constexpr std::size_t kRows = sizeof rows / sizeof rows[0];
 
@@ -103,16 +118,19 @@ extern "C" __attribute__((visibility("default"))) void REALPluginMain(REALResolv
   resolver = r;
   double version = 0;
   if (auto get = service<host_sig::GetRBVersion>("REALGetRBVersion")) version = get();
-  if (auto announce = service<host_sig::RegisterPluginVersion>("RegisterPluginVersion")) announce(version >= 2013 ? 13 : 9);
+  if (auto announce = service<host_sig::RegisterPluginVersion>("RegisterPluginVersion"))
+    announce(version >= 2013 ? 13 : 9);
   if (version >= 2013) {
     auto* record = static_cast<ModuleRecord*>(std::calloc(1, sizeof(ModuleRecord)));
     record->interface_version = 13;
     record->name = strdup("FakeModule");
-    record->methods = static_cast<GlobalMethodEntry*>(std::calloc(kRows, sizeof(GlobalMethodEntry)));
+    record->methods =
+        static_cast<GlobalMethodEntry*>(std::calloc(kRows, sizeof(GlobalMethodEntry)));
     std::memcpy(record->methods, rows, sizeof rows);
     record->method_count = kRows;
     service<host_sig::RegisterModule>("PluginRegisterModule")(record);
   } else {
-    for (GlobalMethodEntry& row : rows) service<host_sig::RegisterMethod>("PluginRegisterMethod")(&row);
+    for (GlobalMethodEntry& row : rows)
+      service<host_sig::RegisterMethod>("PluginRegisterMethod")(&row);
   }
 }
