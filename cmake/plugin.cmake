@@ -1,8 +1,9 @@
-# The plug-in: every .cpp of the frame and the four families, except tests
-# and benchmarks, compiled once into zul_objects. zul_core (static) is what
+# The plug-in: every .cpp of the shared host-free primitives (common/), the
+# frame and the four families, except tests and benchmarks, compiled once
+# into zul_objects. zul_core (static) is what
 # unit tests link; StringGlobalsZUL (shared) is what users ship, exporting
 # REALPluginMain and nothing else.
-set(ZUL_FAMILIES plugin search encodings binary text)
+set(ZUL_FAMILIES common plugin search encodings binary text)
 set(ZUL_SOURCES "")
 foreach(dir IN LISTS ZUL_FAMILIES)
   file(GLOB family_sources CONFIGURE_DEPENDS "${PROJECT_SOURCE_DIR}/${dir}/*.cpp")

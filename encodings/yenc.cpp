@@ -30,22 +30,4 @@ std::string decode_yenc(std::string_view in) {
   return out;
 }
 
-namespace detail {
-
-std::string decode_yenc_scalar(std::string_view in) {
-  std::string out;
-  out.reserve(in.size());
-  for (std::size_t i = 0; i < in.size();) {
-    auto b = static_cast<std::uint8_t>(in[i++]);
-    if (b == '=') {
-      b = i < in.size() ? static_cast<std::uint8_t>(in[i]) : 0;
-      ++i;
-      b = static_cast<std::uint8_t>(b - 64);
-    }
-    out += static_cast<char>(static_cast<std::uint8_t>(b - 42));
-  }
-  return out;
-}
-
-}  // namespace detail
 }  // namespace zul::encodings

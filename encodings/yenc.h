@@ -13,9 +13,4 @@ namespace zul::encodings {
 // Output is never longer than the input.
 std::string decode_yenc(std::string_view in);
 
-namespace detail {
-// One byte at a time, as the reference for decode_yenc.
-std::string decode_yenc_scalar(std::string_view in);
-}  // namespace detail
-
 }  // namespace zul::encodings

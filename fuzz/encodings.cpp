@@ -18,6 +18,7 @@
 #include "encodings/url.h"
 #include "encodings/yenc.h"
 #include "fuzz/fuzz_check.h"
+#include "tests/reference/yenc_reference.h"
 
 using zul_fuzz::check;
 namespace enc = zul::encodings;
@@ -42,7 +43,7 @@ extern "C" int LLVMFuzzerTestOneInput(const std::uint8_t* data, std::size_t size
       break;
     }
     case 3:
-      check(enc::decode_yenc(in) == enc::detail::decode_yenc_scalar(in));
+      check(enc::decode_yenc(in) == zul::reference::decode_yenc_reference(in));
       break;
     case 4: {
       std::string flat(in);
