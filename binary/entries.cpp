@@ -16,6 +16,7 @@
 #include "binary/hex.h"
 #include "binary/hex_dump.h"
 #include "binary/readable_runs.h"
+#include "common/size_gate.h"
 #include "plugin/exceptions.h"
 #include "plugin/host_services.h"
 #include "plugin/natives.h"
@@ -28,10 +29,6 @@ namespace {
 using text_encoding::kASCII;
 using text_encoding::kUnknown;
 using text_encoding::kUTF8;
-
-// The longest string the host accepts from the result builder; longer
-// results would come back empty, so they are not computed at all.
-constexpr std::int64_t kMaxResult = 0x7FFFFFFF;
 
 REALstring build_bytes(std::string_view bytes) { return build_string(bytes, kUnknown); }
 
@@ -65,6 +62,7 @@ REALstring StringAND(REALstring a, REALstring b) {
   if (!a || !b) return nullptr;
   return quietly<REALstring>(nullptr, [&] {
     const rbData data(a), mask(b);
+    if (!zul::fits_result(data.bytes().size())) return REALstring{};
     return build_bytes(zul::binary::and_with_mask(data.bytes(), mask.bytes()));
   });
 }
@@ -73,6 +71,7 @@ REALstring StringOR(REALstring a, REALstring b) {
   if (!a || !b) return nullptr;
   return quietly<REALstring>(nullptr, [&] {
     const rbData data(a), mask(b);
+    if (!zul::fits_result(data.bytes().size())) return REALstring{};
     return build_bytes(zul::binary::or_with_mask(data.bytes(), mask.bytes()));
   });
 }
@@ -81,6 +80,7 @@ REALstring StringXOR(REALstring data, REALstring mask, int64_t mask_offset) {
   if (!data || !mask) return nullptr;
   return quietly<REALstring>(nullptr, [&] {
     const rbData d(data), m(mask);
+    if (!zul::fits_result(d.bytes().size())) return REALstring{};
     return build_bytes(zul::binary::xor_with_mask(d.bytes(), m.bytes(), mask_offset));
   });
 }
@@ -89,6 +89,7 @@ REALstring StringXOR2(REALstring data, REALstring mask, int64_t mask_offset) {
   if (!data || !mask) return nullptr;
   return quietly<REALstring>(nullptr, [&] {
     const rbData d(data), m(mask);
+    if (!zul::fits_result(d.bytes().size())) return REALstring{};
     return build_bytes(zul::binary::xor_with_mask_and_position(d.bytes(), m.bytes(), mask_offset));
   });
 }
@@ -119,7 +120,7 @@ REALstring CreateStringZUL(int64_t length, REALstring content) {
     // does not fit in 64 bits cannot be allocated.
     const std::int64_t unit = c.length == 0 ? 1 : c.length;
     if (length > std::numeric_limits<std::int64_t>::max() - unit - 4) throw std::bad_alloc();
-    if (length > kMaxResult) return nullptr;
+    if (!zul::fits_result(static_cast<std::uint64_t>(length))) return nullptr;
     const std::string bytes =
         zul::binary::repeat_to_length(c.bytes(), static_cast<std::size_t>(length));
     // A null content has no encoding to ask the host about; its zero bytes
@@ -129,7 +130,7 @@ REALstring CreateStringZUL(int64_t length, REALstring content) {
 }
 
 REALstring RandomBytesStringZUL(int64_t length, signed char ascii) {
-  if (length < 1 || length > kMaxResult) return nullptr;
+  if (length < 1 || !zul::fits_result(static_cast<std::uint64_t>(length))) return nullptr;
   return quietly<REALstring>(nullptr, [&] {
     const bool as_ascii = ascii != 0;
     const std::string bytes = zul::binary::random_bytes(static_cast<std::size_t>(length), as_ascii);
@@ -141,7 +142,7 @@ REALstring EncodingToHex(REALstring s) {
   if (!s) return nullptr;
   return quietly<REALstring>(nullptr, [&]() -> REALstring {
     const rbData in(s);
-    if (in.length < 1 || in.length > kMaxResult / 2) return nullptr;
+    if (in.length < 1 || !zul::result_size().add_times(2, in.bytes().size()).fits()) return nullptr;
     return build_string(zul::binary::encode_hex(in.bytes()), kASCII);
   });
 }
