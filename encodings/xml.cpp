@@ -1,6 +1,7 @@
-// XML escaping: one pass, output reserved once (one code point per input
-// character + 4 Ki) and grown only up to the result limit; the five markup characters are the only
-// ones XML 1.0 text needs escaped. The readiness test is one table look-up per byte.
+// XML escaping: one pass, output reserved once for the worst case (6 code
+// points per character), capped at the result limit; the five markup
+// characters are the only ones XML 1.0 text needs escaped. The readiness
+// test is one table look-up per byte.
 #include "encodings/xml.h"
 
 #include <array>
@@ -42,7 +43,7 @@ code_points encode_xml(code_point_view text, std::int64_t options, std::uint64_t
   if (!text.empty() && (text[0] == 0xFEFF || text[0] == 0xFFFE)) text = text.subspan(1);
   const bool named_apostrophe = (options & 1) != 0;
   code_points out;
-  out.reserve(capped_reserve(std::uint64_t{text.size()} + 4096, limit));
+  out.reserve(worst_case_reserve(text.size(), 6, 0, limit));
   for (const std::uint32_t c : text) {
     bool fits = true;
     switch (c) {

@@ -5,6 +5,7 @@
 // follows the well-formedness table row by row.
 #include "text/utf8_repair.h"
 
+#include <algorithm>
 #include <array>
 #include <cstring>
 
@@ -39,8 +40,9 @@ constexpr std::uint64_t kHighBits = 0x8080808080808080ull;
 
 bool in(std::uint8_t c, std::uint8_t low, std::uint8_t high) { return c >= low && c <= high; }
 
-std::size_t reserve_size(std::size_t n, std::uint64_t limit) {
-  return capped_reserve(std::uint64_t{n} + 4096, limit);
+// Each byte is kept or replaced: the worst case, capped at the limit.
+std::size_t reserve_size(std::size_t n, std::string_view placeholder, std::uint64_t limit) {
+  return worst_case_reserve(n, std::max<std::size_t>(placeholder.size(), 1), 0, limit);
 }
 
 }  // namespace
@@ -102,7 +104,7 @@ std::size_t well_formed_prefix(bytes_view bytes) noexcept {
 
 std::string repair_utf8(bytes_view bytes, std::string_view placeholder, std::uint64_t limit) {
   std::string out;
-  out.reserve(reserve_size(bytes.size(), limit));
+  out.reserve(reserve_size(bytes.size(), placeholder, limit));
   std::size_t i = 0;
   while (i < bytes.size()) {
     const std::size_t run = well_formed_prefix(bytes.subspan(i));
@@ -121,7 +123,7 @@ namespace detail {
 
 std::string repair_utf8_scalar(bytes_view bytes, std::string_view placeholder) {
   std::string out;
-  out.reserve(reserve_size(bytes.size(), kMaxResultBytes));
+  out.reserve(reserve_size(bytes.size(), placeholder, kMaxResultBytes));
   std::size_t i = 0;
   while (i < bytes.size()) {
     const std::size_t length = well_formed_length(bytes.subspan(i));
