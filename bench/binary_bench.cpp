@@ -14,7 +14,7 @@
 
 namespace {
 
-using zul::binary::bytes_view;
+using zul::bytes_view;
 namespace detail = zul::binary::detail;
 
 std::vector<std::uint8_t> noise(std::size_t n) {

@@ -79,7 +79,7 @@ const std::string& utf8_text(int kind) {
   return texts[static_cast<std::size_t>(kind)];
 }
 
-zul::text::bytes_view bytes(const std::string& s) {
+zul::bytes_view bytes(const std::string& s) {
   return {reinterpret_cast<const std::uint8_t*>(s.data()), s.size()};
 }
 

@@ -10,9 +10,9 @@
 #include <span>
 #include <string>
 
-namespace zul::binary {
+#include "common/bytes.h"
 
-using bytes_view = std::span<const std::uint8_t>;
+namespace zul::binary {
 
 // data[i] AND mask[i mod m]. Empty data or an empty mask give "".
 std::string and_with_mask(bytes_view data, bytes_view mask);

@@ -10,25 +10,11 @@
 #include <charconv>
 #include <string_view>
 
+#include "common/markup.h"
 #include "encodings/html_entities.h"
 
 namespace zul::encodings {
 namespace {
-
-bool is_byte_order_mark(std::uint32_t c) { return c == 0xFEFF || c == 0xFFFE; }
-
-code_point_view skip_byte_order_mark(code_point_view text) {
-  return !text.empty() && is_byte_order_mark(text[0]) ? text.subspan(1) : text;
-}
-
-// Controls other than tab, LF and CR are dropped from rewritten text.
-constexpr bool is_dropped_control(std::uint32_t c) {
-  return c < 32 && c != 9 && c != 10 && c != 13;
-}
-
-constexpr bool is_markup(std::uint32_t c) {
-  return c == '"' || c == '&' || c == '\'' || c == '<' || c == '>';
-}
 
 void append_numeric_reference(std::string& out, std::uint32_t cp) {
   char digits[10];

@@ -8,7 +8,7 @@
 #include <array>
 #include <cstring>
 
-#include "encodings/hex_digits.h"
+#include "common/hex_digits.h"
 
 namespace zul::encodings {
 namespace {

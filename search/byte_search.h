@@ -7,9 +7,9 @@
 #include <cstdint>
 #include <span>
 
-namespace zul::search {
+#include "common/bytes.h"
 
-using bytes_view = std::span<const std::uint8_t>;
+namespace zul::search {
 
 // An inclusive range of byte values; first > last contains nothing. Bounds
 // are taken as given (no clamping to a byte, no swapping).

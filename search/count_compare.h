@@ -7,9 +7,9 @@
 #include <cstdint>
 #include <span>
 
-namespace zul::search {
+#include "common/bytes.h"
 
-using bytes_view = std::span<const std::uint8_t>;
+namespace zul::search {
 
 // Number of non-overlapping occurrences of find in s, scanning left to right
 // and resuming after each match ("aa" occurs twice in "aaaa", once in

@@ -10,32 +10,10 @@
 #include <limits>
 #include <stdexcept>
 
+#include "common/utf8.h"
+
 namespace zul::text {
 namespace {
-
-// One row of the well-formedness table, keyed by the first byte: the length
-// of the sequence (0: the byte begins none) and the range of the second
-// byte. Third and fourth bytes are always 80..BF.
-struct lead_row {
-  std::uint8_t length;
-  std::uint8_t second_low;
-  std::uint8_t second_high;
-};
-
-constexpr std::array<lead_row, 256> make_lead_table() {
-  std::array<lead_row, 256> t{};
-  for (int c = 0x00; c <= 0x7F; ++c) t[c] = {1, 0, 0};
-  for (int c = 0xC2; c <= 0xDF; ++c) t[c] = {2, 0x80, 0xBF};
-  t[0xE0] = {3, 0xA0, 0xBF};
-  for (int c = 0xE1; c <= 0xEC; ++c) t[c] = {3, 0x80, 0xBF};
-  t[0xED] = {3, 0x80, 0x9F};
-  t[0xEE] = t[0xEF] = {3, 0x80, 0xBF};
-  t[0xF0] = {4, 0x90, 0xBF};
-  for (int c = 0xF1; c <= 0xF3; ++c) t[c] = {4, 0x80, 0xBF};
-  t[0xF4] = {4, 0x80, 0x8F};
-  return t;
-}
-constexpr std::array<lead_row, 256> kLeadTable = make_lead_table();
 
 constexpr std::uint64_t kHighBits = 0x8080808080808080ull;
 
@@ -93,11 +71,11 @@ std::size_t well_formed_prefix(bytes_view bytes) noexcept {
       ++i;
       continue;
     }
-    const lead_row row = kLeadTable[c];
+    const utf8_lead row = kUtf8Leads[c];
     if (row.length == 0 || n - i < row.length) return i;
     if (p[i + 1] < row.second_low || p[i + 1] > row.second_high) return i;
-    if (row.length >= 3 && (p[i + 2] & 0xC0) != 0x80) return i;
-    if (row.length == 4 && (p[i + 3] & 0xC0) != 0x80) return i;
+    if (row.length >= 3 && !is_utf8_continuation(p[i + 2])) return i;
+    if (row.length == 4 && !is_utf8_continuation(p[i + 3])) return i;
     i += row.length;
   }
   return n;

@@ -11,9 +11,9 @@
 #include <string>
 #include <string_view>
 
-namespace zul::text {
+#include "common/bytes.h"
 
-using bytes_view = std::span<const std::uint8_t>;
+namespace zul::text {
 
 // Length (1 to 4) of the well-formed sequence that bytes begins with, or 0
 // when its first byte begins none (also when the end cuts the sequence short
