@@ -41,17 +41,6 @@ std::uint64_t digits_of_four(const std::uint8_t* in) {
 
 }  // namespace
 
-namespace detail {
-
-void encode_hex_scalar(std::span<const std::uint8_t> bytes, char* out) {
-  for (std::uint8_t b : bytes) {
-    *out++ = kHexDigits[b >> 4];
-    *out++ = kHexDigits[b & 0x0F];
-  }
-}
-
-}  // namespace detail
-
 std::string encode_hex(std::span<const std::uint8_t> bytes) {
   std::string out(2 * bytes.size(), '\0');
   char* p = out.data();

@@ -18,12 +18,4 @@ std::string encode_hex(std::span<const std::uint8_t> bytes);
 // count 0); "" when text has fewer than two characters.
 std::string decode_hex(std::string_view text);
 
-namespace detail {
-
-// One byte at a time through kHexDigits: the reference encode_hex (which
-// writes two digits per table load) is tested against. out has room for
-// 2 * bytes.size() characters.
-void encode_hex_scalar(std::span<const std::uint8_t> bytes, char* out);
-
-}  // namespace detail
 }  // namespace zul::binary

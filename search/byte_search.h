@@ -31,14 +31,4 @@ std::int64_t find_in_ranges(bytes_view target, std::span<const byte_range> range
 std::int64_t find_in_signed_ranges_or_set(bytes_view target, std::span<const byte_range> ranges,
                                           bytes_view set);
 
-namespace detail {
-// Reference versions: for each target byte, the ranges and then the set
-// bytes are tested in order. The table-driven versions above must agree.
-std::int64_t find_first_of_scalar(bytes_view target, bytes_view set);
-std::int64_t find_in_ranges_scalar(bytes_view target, std::span<const byte_range> ranges);
-std::int64_t find_in_signed_ranges_or_set_scalar(bytes_view target,
-                                                 std::span<const byte_range> ranges,
-                                                 bytes_view set);
-}  // namespace detail
-
 }  // namespace zul::search

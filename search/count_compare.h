@@ -22,11 +22,4 @@ std::int64_t count_occurrences(bytes_view s, bytes_view find) noexcept;
 // string is all zero bytes, in which case the two compare equal.
 int compare_bytes(bytes_view a, bytes_view b) noexcept;
 
-namespace detail {
-// Reference versions: a plain position-by-position scan. The versions above
-// (memchr / memcmp based) must agree with them.
-std::int64_t count_occurrences_scalar(bytes_view s, bytes_view find) noexcept;
-int compare_bytes_scalar(bytes_view a, bytes_view b) noexcept;
-}  // namespace detail
-
 }  // namespace zul::search

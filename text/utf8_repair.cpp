@@ -1,8 +1,8 @@
 // UTF-8 repair in one forward pass: well_formed_prefix runs over the valid
 // stretch (eight ASCII bytes per step, then one table look-up per lead byte)
 // and the stretch is appended in one copy; only the byte where it stopped is
-// replaced, and the scan resumes right after it. The per-position reference
-// follows the well-formedness table row by row.
+// replaced, and the scan resumes right after it. Tests compare it with a
+// per-position reference (tests/reference/utf8_repair_reference.h).
 #include "text/utf8_repair.h"
 
 #include <array>
@@ -17,40 +17,12 @@ namespace {
 
 constexpr std::uint64_t kHighBits = 0x8080808080808080ull;
 
-bool in(std::uint8_t c, std::uint8_t low, std::uint8_t high) { return c >= low && c <= high; }
-
 std::size_t reserve_size(std::size_t n) {
   if (n > std::numeric_limits<std::size_t>::max() - 4096) throw std::length_error("utf8 repair");
   return n + 4096;
 }
 
 }  // namespace
-
-std::size_t well_formed_length(bytes_view b) noexcept {
-  if (b.empty()) return 0;
-  const std::uint8_t c = b[0];
-  std::size_t length;
-  std::uint8_t low = 0x80, high = 0xBF;  // range of the second byte
-  if (c <= 0x7F) return 1;
-  if (in(c, 0xC2, 0xDF)) {
-    length = 2;
-  } else if (in(c, 0xE0, 0xEF)) {
-    length = 3;
-    if (c == 0xE0) low = 0xA0;
-    if (c == 0xED) high = 0x9F;
-  } else if (in(c, 0xF0, 0xF4)) {
-    length = 4;
-    if (c == 0xF0) low = 0x90;
-    if (c == 0xF4) high = 0x8F;
-  } else {
-    return 0;  // 80..C1 and F5..FF begin nothing
-  }
-  if (b.size() < length || !in(b[1], low, high)) return 0;
-  for (std::size_t k = 2; k < length; ++k) {
-    if (!in(b[k], 0x80, 0xBF)) return 0;
-  }
-  return length;
-}
 
 std::size_t well_formed_prefix(bytes_view bytes) noexcept {
   const std::uint8_t* const p = bytes.data();
@@ -95,26 +67,5 @@ std::string repair_utf8(bytes_view bytes, std::string_view placeholder) {
   }
   return out;
 }
-
-namespace detail {
-
-std::string repair_utf8_scalar(bytes_view bytes, std::string_view placeholder) {
-  std::string out;
-  out.reserve(reserve_size(bytes.size()));
-  std::size_t i = 0;
-  while (i < bytes.size()) {
-    const std::size_t length = well_formed_length(bytes.subspan(i));
-    if (length == 0) {
-      out.append(placeholder);
-      ++i;
-    } else {
-      out.append(reinterpret_cast<const char*>(bytes.data() + i), length);
-      i += length;
-    }
-  }
-  return out;
-}
-
-}  // namespace detail
 
 }  // namespace zul::text
