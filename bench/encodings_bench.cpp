@@ -9,6 +9,8 @@
 
 #include "encodings/html.h"
 #include "encodings/url.h"
+#include "tests/reference/html_reference.h"
+#include "tests/reference/url_reference.h"
 
 namespace {
 
@@ -80,10 +82,14 @@ std::string encode_html_at_limit(enc::code_point_view text, std::int64_t options
 }
 
 BENCHMARK(BM_url<encode_url_at_limit>)->Name("BM_encode_url")->Apply(sizes);
-BENCHMARK(BM_url<enc::detail::encode_url_scalar>)->Name("BM_encode_url_scalar")->Apply(sizes);
+BENCHMARK(BM_url<zul::reference::encode_url_reference>)
+    ->Name("BM_encode_url_reference")
+    ->Apply(sizes);
 BENCHMARK(BM_decode_url)->Apply(sizes);
 BENCHMARK(BM_html<encode_html_at_limit>)->Name("BM_encode_html")->Apply(sizes);
-BENCHMARK(BM_html<enc::detail::encode_html_scalar>)->Name("BM_encode_html_scalar")->Apply(sizes);
+BENCHMARK(BM_html<zul::reference::encode_html_reference>)
+    ->Name("BM_encode_html_reference")
+    ->Apply(sizes);
 BENCHMARK(BM_decode_html)->Apply(sizes);
 
 }  // namespace

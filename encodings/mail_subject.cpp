@@ -4,8 +4,8 @@
 // tab or control byte unencoded inside an encoded word.
 #include "encodings/mail_subject.h"
 
+#include "common/hex_digits.h"
 #include "common/size_gate.h"
-#include "encodings/hex_digits.h"
 
 namespace zul::encodings {
 

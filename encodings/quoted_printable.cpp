@@ -6,8 +6,8 @@
 
 #include <array>
 
+#include "common/hex_digits.h"
 #include "common/size_gate.h"
-#include "encodings/hex_digits.h"
 
 namespace zul::encodings {
 namespace {

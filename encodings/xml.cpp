@@ -6,14 +6,11 @@
 
 #include <array>
 
+#include "common/markup.h"
 #include "common/size_gate.h"
 
 namespace zul::encodings {
 namespace {
-
-constexpr bool is_markup(std::uint32_t c) {
-  return c == '"' || c == '&' || c == '\'' || c == '<' || c == '>';
-}
 
 // Appends the reference's characters; false, writing nothing, when the
 // output would pass limit code points.
@@ -40,7 +37,7 @@ bool xml_needs_escaping(code_point_view text) {
 }
 
 code_points encode_xml(code_point_view text, std::int64_t options, std::uint64_t limit) {
-  if (!text.empty() && (text[0] == 0xFEFF || text[0] == 0xFFFE)) text = text.subspan(1);
+  text = skip_byte_order_mark(text);
   const bool named_apostrophe = (options & 1) != 0;
   code_points out;
   out.reserve(worst_case_reserve(text.size(), 6, 0, limit));
@@ -63,7 +60,7 @@ code_points encode_xml(code_point_view text, std::int64_t options, std::uint64_t
         fits = append(out, "&gt;", limit);
         break;
       default:
-        if (c >= 32 || c == 9 || c == 10 || c == 13) {
+        if (!is_dropped_control(c)) {
           fits = make_room(out, 1, limit);
           if (fits) out.push_back(c);
         }
