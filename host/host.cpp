@@ -89,6 +89,8 @@ void Host::load(const std::string& plugin_path) {
 
 const Registration& Host::registration() const { return impl_->registration; }
 
+void Host::make_live() { detail::set_live_host(impl_); }
+
 void* Host::library_symbol(const char* name) const {
   std::lock_guard lock(impl_->mu);
   return impl_->library ? dlsym(impl_->library, name) : nullptr;

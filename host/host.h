@@ -108,6 +108,10 @@ class Host {
   // std::runtime_error when the file cannot be loaded or has no entry.
   void load(const std::string& plugin_path);
   const Registration& registration() const;
+  // Makes this Host the live one again (a new Host becomes live when it is
+  // made): for callers that keep several Hosts, say one per host version,
+  // and call each one's plug-in only while that Host is live.
+  void make_live();
   // The native function registered under exactly this declaration, or null.
   void* find(std::string_view declaration) const;
   // A symbol the loaded plug-in exports (dlsym), or null: for test builds
