@@ -14,6 +14,9 @@
 #include "host/text_convert.h"
 
 namespace zul_host {
+
+using namespace text_encoding;
+
 namespace {
 
 constexpr std::string_view kUsage =

@@ -10,6 +10,8 @@
 
 namespace {
 
+using namespace text_encoding;
+
 using namespace zul_host;
 
 TEST(parse_argument, forms_by_type) {
