@@ -112,17 +112,19 @@ REALstring EncodingToXML(REALstring s, std::int64_t options) noexcept {
   });
 }
 
-// Ready means: stored as ASCII-compatible text and holding only bytes 1..127
-// other than the five markup characters.
+// Ready means: empty, or stored as ASCII-compatible text and holding only
+// bytes 1..127 other than the five markup characters. An empty string is
+// ready whatever its encoding tag: there is nothing in it to escape.
 static bool is_markup_ready(REALstring s) {
   if (!s) return true;
+  rbData in(s);
+  if (in.empty()) return true;
   bool available = false;
   const std::uint32_t encoding = REALGetStringEncoding(s, &available);
   if (available && encoding != kMacRoman && encoding != kWindowsLatin1 && encoding != kASCII &&
       encoding != kUTF8) {
     return false;
   }
-  rbData in(s);
   return enc::is_markup_free_ascii(in.view());
 }
 
