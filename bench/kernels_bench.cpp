@@ -10,6 +10,7 @@
 #include <vector>
 
 #include "common/byte_set.h"
+#include "search/count_kernels.h"
 
 namespace {
 
@@ -49,6 +50,23 @@ void find_first_in_set_bench(benchmark::State& state, isa level, const char* mem
   set_bytes(state);
 }
 
+void count_byte_bench(benchmark::State& state, isa level) {
+  const auto& k = kernels_for(zul::search::detail::count_tables(), level);
+  const auto& in = text(state.range(0));
+  for (auto _ : state) benchmark::DoNotOptimize(k.count_byte(in.data(), in.size(), 'e'));
+  set_bytes(state);
+}
+
+// The pattern's first byte occurs every 26 bytes, its last byte never.
+void count_pattern_bench(benchmark::State& state, isa level, std::string_view find) {
+  const auto& k = kernels_for(zul::search::detail::count_tables(), level);
+  const auto& in = text(state.range(0));
+  const auto* f = reinterpret_cast<const std::uint8_t*>(find.data());
+  for (auto _ : state)
+    benchmark::DoNotOptimize(k.count_pattern(in.data(), in.size(), f, find.size()));
+  set_bytes(state);
+}
+
 void sizes(benchmark::internal::Benchmark* b) { b->Arg(1 << 10)->Arg(1 << 20)->Arg(64 << 20); }
 
 const bool registered = [] {
@@ -59,6 +77,11 @@ const bool registered = [] {
                                        find_first_in_set_bench, level, "\t\r\n\f"));
     sizes(benchmark::RegisterBenchmark(("find_first_in_set_16/" + name).c_str(),
                                        find_first_in_set_bench, level, "\t\r\n\f<>&\"'%=;:!?#"));
+    sizes(benchmark::RegisterBenchmark(("count_byte/" + name).c_str(), count_byte_bench, level));
+    sizes(benchmark::RegisterBenchmark(("count_pattern_4/" + name).c_str(), count_pattern_bench,
+                                       level, "efg!"));
+    sizes(benchmark::RegisterBenchmark(("count_pattern_16/" + name).c_str(), count_pattern_bench,
+                                       level, "efghijklmnopqrs!"));
   }
   return true;
 }();
