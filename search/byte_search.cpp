@@ -1,8 +1,8 @@
 // Byte search. The fast versions turn the set and the ranges into one
 // prepared byte set (two 16-byte nibble tables, on the stack) and run the
 // machine's byte-set kernel, whose work per block does not depend on the
-// size of the set; a set of one byte goes to memchr. The scalar versions
-// follow the plain definition and serve as the reference in tests.
+// size of the set; a set of one byte goes to memchr. Tests compare them
+// with byte-at-a-time references (tests/reference/byte_search_reference.h).
 #include "search/byte_search.h"
 
 #include <cstring>
@@ -11,10 +11,6 @@
 
 namespace zul::search {
 namespace {
-
-bool in_range(std::int64_t value, const byte_range& r) {
-  return r.first <= value && value <= r.last;
-}
 
 // Adds the part of an inclusive range of byte values, read as min..max
 // (0..255 unsigned or -128..127 signed), that holds byte values.
@@ -55,40 +51,4 @@ std::int64_t find_in_signed_ranges_or_set(bytes_view target, std::span<const byt
   return position(target, members);
 }
 
-namespace detail {
-
-std::int64_t find_first_of_scalar(bytes_view target, bytes_view set) {
-  for (std::size_t i = 0; i < target.size(); ++i) {
-    for (std::uint8_t b : set) {
-      if (target[i] == b) return static_cast<std::int64_t>(i) + 1;
-    }
-  }
-  return 0;
-}
-
-std::int64_t find_in_ranges_scalar(bytes_view target, std::span<const byte_range> ranges) {
-  for (std::size_t i = 0; i < target.size(); ++i) {
-    for (const byte_range& r : ranges) {
-      if (in_range(target[i], r)) return static_cast<std::int64_t>(i) + 1;
-    }
-  }
-  return 0;
-}
-
-std::int64_t find_in_signed_ranges_or_set_scalar(bytes_view target,
-                                                 std::span<const byte_range> ranges,
-                                                 bytes_view set) {
-  for (std::size_t i = 0; i < target.size(); ++i) {
-    const std::int64_t value = static_cast<std::int8_t>(target[i]);
-    for (const byte_range& r : ranges) {
-      if (in_range(value, r)) return static_cast<std::int64_t>(i) + 1;
-    }
-    for (std::uint8_t b : set) {
-      if (target[i] == b) return static_cast<std::int64_t>(i) + 1;
-    }
-  }
-  return 0;
-}
-
-}  // namespace detail
 }  // namespace zul::search
