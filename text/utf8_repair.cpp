@@ -7,8 +7,6 @@
 
 #include <array>
 #include <cstring>
-#include <limits>
-#include <stdexcept>
 
 #include "common/utf8.h"
 
@@ -17,9 +15,8 @@ namespace {
 
 constexpr std::uint64_t kHighBits = 0x8080808080808080ull;
 
-std::size_t reserve_size(std::size_t n) {
-  if (n > std::numeric_limits<std::size_t>::max() - 4096) throw std::length_error("utf8 repair");
-  return n + 4096;
+std::size_t reserve_size(std::size_t n, std::uint64_t limit) {
+  return capped_reserve(std::uint64_t{n} + 4096, limit);
 }
 
 }  // namespace
@@ -53,15 +50,17 @@ std::size_t well_formed_prefix(bytes_view bytes) noexcept {
   return n;
 }
 
-std::string repair_utf8(bytes_view bytes, std::string_view placeholder) {
+std::string repair_utf8(bytes_view bytes, std::string_view placeholder, std::uint64_t limit) {
   std::string out;
-  out.reserve(reserve_size(bytes.size()));
+  out.reserve(reserve_size(bytes.size(), limit));
   std::size_t i = 0;
   while (i < bytes.size()) {
     const std::size_t run = well_formed_prefix(bytes.subspan(i));
+    if (!make_room(out, run, limit)) return {};
     out.append(reinterpret_cast<const char*>(bytes.data() + i), run);
     i += run;
     if (i == bytes.size()) break;
+    if (!make_room(out, placeholder.size(), limit)) return {};
     out.append(placeholder);
     ++i;
   }
