@@ -1,19 +1,22 @@
 // XML escaping: one pass, output reserved once (one code point per input
-// character + 4 Ki); the five markup characters are the only ones XML 1.0
-// text needs escaped. The readiness test is one table look-up per byte.
+// character + 4 Ki) and grown only up to the result limit; the five markup characters are the only
+// ones XML 1.0 text needs escaped. The readiness test is one table look-up per byte.
 #include "encodings/xml.h"
 
 #include <array>
 
+#include "common/markup.h"
+#include "common/size_gate.h"
+
 namespace zul::encodings {
 namespace {
 
-constexpr bool is_markup(std::uint32_t c) {
-  return c == '"' || c == '&' || c == '\'' || c == '<' || c == '>';
-}
-
-void append(code_points& out, std::string_view ascii) {
+// Appends the reference's characters; false, writing nothing, when the
+// output would pass limit code points.
+bool append(code_points& out, std::string_view ascii, std::uint64_t limit) {
+  if (!make_room(out, ascii.size(), limit)) return false;
   out.insert(out.end(), ascii.begin(), ascii.end());
+  return true;
 }
 
 // Bytes a ready string may hold: 1..127 except the five markup bytes.
@@ -32,31 +35,36 @@ bool xml_needs_escaping(code_point_view text) {
   return false;
 }
 
-code_points encode_xml(code_point_view text, std::int64_t options) {
-  if (!text.empty() && (text[0] == 0xFEFF || text[0] == 0xFFFE)) text = text.subspan(1);
+code_points encode_xml(code_point_view text, std::int64_t options, std::uint64_t limit) {
+  text = skip_byte_order_mark(text);
   const bool named_apostrophe = (options & 1) != 0;
   code_points out;
-  out.reserve(text.size() + 4096);
+  out.reserve(capped_reserve(std::uint64_t{text.size()} + 4096, limit));
   for (const std::uint32_t c : text) {
+    bool fits = true;
     switch (c) {
       case '"':
-        append(out, "&quot;");
+        fits = append(out, "&quot;", limit);
         break;
       case '&':
-        append(out, "&amp;");
+        fits = append(out, "&amp;", limit);
         break;
       case '\'':
-        append(out, named_apostrophe ? "&apos;" : "&#39;");
+        fits = append(out, named_apostrophe ? "&apos;" : "&#39;", limit);
         break;
       case '<':
-        append(out, "&lt;");
+        fits = append(out, "&lt;", limit);
         break;
       case '>':
-        append(out, "&gt;");
+        fits = append(out, "&gt;", limit);
         break;
       default:
-        if (c >= 32 || c == 9 || c == 10 || c == 13) out.push_back(c);
+        if (!is_dropped_control(c)) {
+          fits = make_room(out, 1, limit);
+          if (fits) out.push_back(c);
+        }
     }
+    if (!fits) return {};
   }
   return out;
 }

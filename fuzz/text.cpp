@@ -21,8 +21,11 @@
 
 #include "fuzz/fuzz_check.h"
 #include "search/distance.h"
+#include "tests/reference/char_class_reference.h"
 #include "tests/reference/distance_reference.h"
+#include "tests/reference/latin1_reference.h"
 #include "tests/reference/number_format_reference.h"
+#include "tests/reference/utf8_repair_reference.h"
 #include "text/char_class.h"
 #include "text/latin1.h"
 #include "text/number_format.h"
@@ -45,14 +48,14 @@ void check_repair(std::span<const std::uint8_t> data, std::uint8_t knob) {
   static constexpr std::string_view kPlaceholders[] = {"", "?", "\xEF\xBF\xBD", "\xFF"};
   const std::string_view placeholder = kPlaceholders[knob % 4];
   const std::string repaired = repair_utf8(data, placeholder);
-  check(repaired == detail::repair_utf8_scalar(data, placeholder));
+  check(repaired == zul::reference::repair_utf8_reference(data, placeholder));
   if (knob % 4 != 3) check(well_formed_prefix(bytes_of(repaired)) == repaired.size());
   check(well_formed_prefix(data) <= data.size());
 }
 
 void check_classes(std::span<const std::uint8_t> data, std::uint8_t replacement) {
   for (auto cls : {byte_class::seven_bit, byte_class::printable, byte_class::non_control}) {
-    check(all_bytes_in(data, cls) == detail::all_bytes_in_scalar(data, cls));
+    check(all_bytes_in(data, cls) == zul::reference::all_bytes_in_reference(data, cls));
   }
   const std::string replaced = replace_non_printable(data, replacement);
   check(replaced.size() == data.size());
@@ -73,9 +76,9 @@ void check_single_byte(std::span<const std::uint8_t> data) {
   const std::vector<std::uint16_t> units =
       units_of({reinterpret_cast<const char*>(data.data()), data.size()});
   check(handle_bytes(encode_single_byte(units, kISO8859_1)) ==
-        handle_bytes(detail::encode_single_byte_scalar(units, escapecharsISO8859)));
+        zul::reference::encode_single_byte_reference(units, escapecharsISO8859));
   check(handle_bytes(encode_single_byte(units, kWindows1252)) ==
-        handle_bytes(detail::encode_single_byte_scalar(units, escapecharsCP1252)));
+        zul::reference::encode_single_byte_reference(units, escapecharsCP1252));
   const owned_handle wide = decode_single_byte(data, kISO8859_1);
   const std::vector<std::uint16_t> back = units_of(handle_bytes(wide));
   check(handle_bytes(encode_single_byte(back, kISO8859_1)) ==
