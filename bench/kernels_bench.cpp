@@ -9,6 +9,7 @@
 #include <string>
 #include <vector>
 
+#include "binary/hex_kernels.h"
 #include "common/byte_set.h"
 #include "search/count_kernels.h"
 
@@ -67,6 +68,29 @@ void count_pattern_bench(benchmark::State& state, isa level, std::string_view fi
   set_bytes(state);
 }
 
+// Figures count input bytes: encode reads n bytes, decode 2n characters.
+void encode_hex_bench(benchmark::State& state, isa level) {
+  const auto& k = kernels_for(zul::binary::detail::hex_tables(), level);
+  const auto& in = text(state.range(0));
+  std::vector<char> out(2 * in.size());
+  for (auto _ : state) {
+    k.encode(in.data(), in.size(), out.data());
+    benchmark::ClobberMemory();
+  }
+  set_bytes(state);
+}
+
+void decode_hex_bench(benchmark::State& state, isa level) {
+  const auto& k = kernels_for(zul::binary::detail::hex_tables(), level);
+  const auto& in = text(state.range(0));
+  std::vector<std::uint8_t> out(in.size() / 2);
+  for (auto _ : state) {
+    k.decode(reinterpret_cast<const char*>(in.data()), out.size(), out.data());
+    benchmark::ClobberMemory();
+  }
+  set_bytes(state);
+}
+
 void sizes(benchmark::internal::Benchmark* b) { b->Arg(1 << 10)->Arg(1 << 20)->Arg(64 << 20); }
 
 const bool registered = [] {
@@ -82,6 +106,8 @@ const bool registered = [] {
                                        level, "efg!"));
     sizes(benchmark::RegisterBenchmark(("count_pattern_16/" + name).c_str(), count_pattern_bench,
                                        level, "efghijklmnopqrs!"));
+    sizes(benchmark::RegisterBenchmark(("encode_hex/" + name).c_str(), encode_hex_bench, level));
+    sizes(benchmark::RegisterBenchmark(("decode_hex/" + name).c_str(), decode_hex_bench, level));
   }
   return true;
 }();
