@@ -6,11 +6,13 @@
 
 #include <cstring>
 #include <map>
+#include <random>
 #include <string>
 #include <vector>
 
 #include "binary/hex_kernels.h"
 #include "common/byte_set.h"
+#include "encodings/yenc_kernels.h"
 #include "search/count_kernels.h"
 
 namespace {
@@ -91,6 +93,32 @@ void decode_hex_bench(benchmark::State& state, isa level) {
   set_bytes(state);
 }
 
+// yEnc-like data: random bytes, with NUL, LF, CR and "=" escaped (about
+// 1.6% of the input are escapes, as in real yEnc parts).
+const std::vector<std::uint8_t>& yenc_data(std::size_t size) {
+  static std::map<std::size_t, std::vector<std::uint8_t>> cache;
+  auto [it, fresh] = cache.try_emplace(size);
+  if (fresh) {
+    std::mt19937 rng(1);
+    auto& d = it->second;
+    while (d.size() < size) {
+      const auto b = static_cast<std::uint8_t>(rng());
+      if (b == 0 || b == '\n' || b == '\r' || b == '=') d.push_back('=');
+      d.push_back(b);
+    }
+    d.resize(size);
+  }
+  return it->second;
+}
+
+void decode_yenc_bench(benchmark::State& state, isa level) {
+  const auto& k = kernels_for(zul::encodings::detail::yenc_tables(), level);
+  const auto& in = yenc_data(state.range(0));
+  std::vector<std::uint8_t> out(in.size());
+  for (auto _ : state) benchmark::DoNotOptimize(k.decode(in.data(), in.size(), out.data()));
+  set_bytes(state);
+}
+
 void sizes(benchmark::internal::Benchmark* b) { b->Arg(1 << 10)->Arg(1 << 20)->Arg(64 << 20); }
 
 const bool registered = [] {
@@ -108,6 +136,7 @@ const bool registered = [] {
                                        level, "efghijklmnopqrs!"));
     sizes(benchmark::RegisterBenchmark(("encode_hex/" + name).c_str(), encode_hex_bench, level));
     sizes(benchmark::RegisterBenchmark(("decode_hex/" + name).c_str(), decode_hex_bench, level));
+    sizes(benchmark::RegisterBenchmark(("decode_yenc/" + name).c_str(), decode_yenc_bench, level));
   }
   return true;
 }();
