@@ -10,6 +10,7 @@
 #include <string>
 #include <vector>
 
+#include "binary/bitwise_kernels.h"
 #include "binary/hex_kernels.h"
 #include "common/byte_set.h"
 #include "encodings/yenc_kernels.h"
@@ -119,6 +120,19 @@ void decode_yenc_bench(benchmark::State& state, isa level) {
   set_bytes(state);
 }
 
+// XOR of two buffers of the same size into a third (the mask walk's run).
+void xor_run_bench(benchmark::State& state, isa level) {
+  const auto& k = kernels_for(zul::binary::detail::bitwise_tables(), level);
+  const auto& in = text(state.range(0));
+  const std::vector<std::uint8_t> mask(in.rbegin(), in.rend());
+  std::vector<std::uint8_t> out(in.size());
+  for (auto _ : state) {
+    k.run[2](in.data(), mask.data(), out.data(), in.size());
+    benchmark::ClobberMemory();
+  }
+  set_bytes(state);
+}
+
 void sizes(benchmark::internal::Benchmark* b) { b->Arg(1 << 10)->Arg(1 << 20)->Arg(64 << 20); }
 
 const bool registered = [] {
@@ -137,6 +151,7 @@ const bool registered = [] {
     sizes(benchmark::RegisterBenchmark(("encode_hex/" + name).c_str(), encode_hex_bench, level));
     sizes(benchmark::RegisterBenchmark(("decode_hex/" + name).c_str(), decode_hex_bench, level));
     sizes(benchmark::RegisterBenchmark(("decode_yenc/" + name).c_str(), decode_yenc_bench, level));
+    sizes(benchmark::RegisterBenchmark(("xor_run/" + name).c_str(), xor_run_bench, level));
   }
   return true;
 }();
