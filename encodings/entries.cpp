@@ -153,11 +153,15 @@ REALstring DecodingToQuotedPrintable(REALstring s) noexcept {
 }
 
 // A subject of printable ASCII (the empty one included) comes back as it is.
+// A subject the host cannot give as UTF-8 (a lone surrogate, odd-length
+// UTF-16, invalid UTF-32) gives null: its stored bytes could not go into a
+// mail header either.
 REALstring EncodeEmailSubjectZUL(REALstring s) noexcept {
   if (!s) return nullptr;
   return trapped<REALstring>(nullptr, [&]() -> REALstring {
     rbText text(s);
     const std::string_view utf8 = text.utf8();
+    if (text.host_failed()) return nullptr;
     if (!enc::subject_needs_encoding(utf8)) return same_string(s);
     return build_string(enc::encode_mail_subject(utf8), kASCII);
   });
