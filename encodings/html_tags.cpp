@@ -1,9 +1,9 @@
-// Tag removal: one pass over the bytes; output reserved once for the input
-// size + 10 and grown only when a replacement text is longer than the tags
-// it stands for, never past the result limit. Runs outside tags are copied
-// whole.
+// Tag removal: one pass over the bytes; output reserved once for the worst
+// case (every byte replaced), capped at the result limit, where removal
+// stops. Runs outside tags are copied whole.
 #include "encodings/html_tags.h"
 
+#include <algorithm>
 #include <cstdint>
 
 namespace zul::encodings {
@@ -11,7 +11,8 @@ namespace zul::encodings {
 std::string remove_html_tags(std::string_view utf8, std::string_view replacement,
                              std::uint64_t limit) {
   std::string out;
-  out.reserve(capped_reserve(std::uint64_t{utf8.size()} + 10, limit));
+  out.reserve(
+      worst_case_reserve(utf8.size(), std::max<std::size_t>(replacement.size(), 1), 10, limit));
   std::int64_t depth = 0;
   const std::size_t n = utf8.size();
   std::size_t i = 0;

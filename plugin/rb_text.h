@@ -44,6 +44,8 @@ class rbText {
   }
 
   bool is_ascii() const { return is_ascii_; }
+  // True when the host could not give the text in a form asked for (the
+  // form then reads as empty text).
   bool host_failed() const { return host_failed_; }
 
  private:

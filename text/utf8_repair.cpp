@@ -5,9 +5,11 @@
 // per-position reference (tests/reference/utf8_repair_reference.h).
 #include "text/utf8_repair.h"
 
+#include <algorithm>
 #include <array>
 #include <cstring>
 
+#include "common/size_gate.h"
 #include "common/utf8.h"
 
 namespace zul::text {
@@ -15,8 +17,9 @@ namespace {
 
 constexpr std::uint64_t kHighBits = 0x8080808080808080ull;
 
-std::size_t reserve_size(std::size_t n, std::uint64_t limit) {
-  return capped_reserve(std::uint64_t{n} + 4096, limit);
+// Each byte is kept or replaced: the worst case, capped at the limit.
+std::size_t reserve_size(std::size_t n, std::string_view placeholder, std::uint64_t limit) {
+  return worst_case_reserve(n, std::max<std::size_t>(placeholder.size(), 1), 0, limit);
 }
 
 }  // namespace
@@ -52,7 +55,7 @@ std::size_t well_formed_prefix(bytes_view bytes) noexcept {
 
 std::string repair_utf8(bytes_view bytes, std::string_view placeholder, std::uint64_t limit) {
   std::string out;
-  out.reserve(reserve_size(bytes.size(), limit));
+  out.reserve(reserve_size(bytes.size(), placeholder, limit));
   std::size_t i = 0;
   while (i < bytes.size()) {
     const std::size_t run = well_formed_prefix(bytes.subspan(i));
