@@ -17,6 +17,7 @@
 #include "binary/hex.h"
 #include "binary/hex_dump.h"
 #include "binary/readable_runs.h"
+#include "common/size_gate.h"
 #include "plugin/exceptions.h"
 #include "plugin/host_services.h"
 #include "plugin/natives.h"
@@ -29,10 +30,6 @@ namespace {
 using text_encoding::kASCII;
 using text_encoding::kUnknown;
 using text_encoding::kUTF8;
-
-// The longest string the host accepts from the result builder; longer
-// results would come back empty, so they are not computed at all.
-constexpr std::int64_t kMaxResult = 0x7FFFFFFF;
 
 REALstring build_bytes(std::string_view bytes) { return build_string(bytes, kUnknown); }
 
@@ -61,6 +58,7 @@ REALstring StringAND(REALstring a, REALstring b) noexcept {
   if (!a || !b) return nullptr;
   return quietly<REALstring>(nullptr, [&] {
     const rbData data(a), mask(b);
+    if (!zul::fits_result(data.bytes().size())) return REALstring{};
     return build_bytes(zul::binary::and_with_mask(data.bytes(), mask.bytes()));
   });
 }
@@ -69,22 +67,25 @@ REALstring StringOR(REALstring a, REALstring b) noexcept {
   if (!a || !b) return nullptr;
   return quietly<REALstring>(nullptr, [&] {
     const rbData data(a), mask(b);
+    if (!zul::fits_result(data.bytes().size())) return REALstring{};
     return build_bytes(zul::binary::or_with_mask(data.bytes(), mask.bytes()));
   });
 }
 
-REALstring StringXOR(REALstring data, REALstring mask, int64_t mask_offset) noexcept {
+REALstring StringXOR(REALstring data, REALstring mask, std::int64_t mask_offset) noexcept {
   if (!data || !mask) return nullptr;
   return quietly<REALstring>(nullptr, [&] {
     const rbData d(data), m(mask);
+    if (!zul::fits_result(d.bytes().size())) return REALstring{};
     return build_bytes(zul::binary::xor_with_mask(d.bytes(), m.bytes(), mask_offset));
   });
 }
 
-REALstring StringXOR2(REALstring data, REALstring mask, int64_t mask_offset) noexcept {
+REALstring StringXOR2(REALstring data, REALstring mask, std::int64_t mask_offset) noexcept {
   if (!data || !mask) return nullptr;
   return quietly<REALstring>(nullptr, [&] {
     const rbData d(data), m(mask);
+    if (!zul::fits_result(d.bytes().size())) return REALstring{};
     return build_bytes(zul::binary::xor_with_mask_and_position(d.bytes(), m.bytes(), mask_offset));
   });
 }
@@ -109,15 +110,16 @@ REALstring ConcatBinaryStringsZUL2(REALstring a, REALstring b) noexcept {
                              [&] { return concat(a, b, nullptr, nullptr, nullptr, nullptr); });
 }
 
-REALstring CreateStringZUL(int64_t length, REALstring content) noexcept {
+REALstring CreateStringZUL(std::int64_t length, REALstring content) noexcept {
   if (length < 1) return nullptr;
   return trapped<REALstring>(nullptr, [&]() -> REALstring {
     const rbData c(content);
-    // The work buffer holds length + one pattern unit + 4 bytes; a size that
-    // does not fit in 64 bits cannot be allocated.
+    // A length for which length + one pattern unit + 4 is no positive 64-bit
+    // size counts as a failed allocation (OutOfMemoryException); the output
+    // itself is exactly length bytes.
     const std::int64_t unit = c.length == 0 ? 1 : c.length;
     if (length > std::numeric_limits<std::int64_t>::max() - unit - 4) throw std::bad_alloc();
-    if (length > kMaxResult) return nullptr;
+    if (!zul::fits_result(static_cast<std::uint64_t>(length))) return nullptr;
     const std::string bytes =
         zul::binary::repeat_to_length(c.bytes(), static_cast<std::size_t>(length));
     // A null content has no encoding to ask the host about; its zero bytes
@@ -126,8 +128,8 @@ REALstring CreateStringZUL(int64_t length, REALstring content) noexcept {
   });
 }
 
-REALstring RandomBytesStringZUL(int64_t length, signed char ascii) noexcept {
-  if (length < 1 || length > kMaxResult) return nullptr;
+REALstring RandomBytesStringZUL(std::int64_t length, signed char ascii) noexcept {
+  if (length < 1 || !zul::fits_result(static_cast<std::uint64_t>(length))) return nullptr;
   return quietly<REALstring>(nullptr, [&] {
     const bool as_ascii = ascii != 0;
     const std::string bytes = zul::binary::random_bytes(static_cast<std::size_t>(length), as_ascii);
@@ -139,7 +141,7 @@ REALstring EncodingToHex(REALstring s) noexcept {
   if (!s) return nullptr;
   return quietly<REALstring>(nullptr, [&]() -> REALstring {
     const rbData in(s);
-    if (in.length < 1 || in.length > kMaxResult / 2) return nullptr;
+    if (in.length < 1 || !zul::result_size().add_times(2, in.bytes().size()).fits()) return nullptr;
     return build_string(zul::binary::encode_hex(in.bytes()), kASCII);
   });
 }
@@ -153,8 +155,9 @@ REALstring DecodingToHex(REALstring s) noexcept {
   });
 }
 
-REALstring Hexstring(REALstring input, int64_t hexlen, int64_t linelen, REALstring linestart,
-                     REALstring lineend, REALstring spacer, REALstring filler) noexcept {
+REALstring Hexstring(REALstring input, std::int64_t hexlen, std::int64_t linelen,
+                     REALstring linestart, REALstring lineend, REALstring spacer,
+                     REALstring filler) noexcept {
   if (!input || hexlen == 0 || linelen == 0) return nullptr;
   return trapped<REALstring>(nullptr, [&] {
     const rbData in(input), fill(filler);
@@ -165,12 +168,12 @@ REALstring Hexstring(REALstring input, int64_t hexlen, int64_t linelen, REALstri
   });
 }
 
-REALarray GetStringsZULp(void* data, int64_t size, int64_t min_length) noexcept {
+REALarray GetStringsZULp(void* data, std::int64_t size, std::int64_t min_length) noexcept {
   if (size < 0) return nullptr;
   return quietly<REALarray>(nullptr, [&] { return collect_runs(data, size, min_length); });
 }
 
-REALarray GetStringsZULm(REALmemoryBlock data, int64_t min_length) noexcept {
+REALarray GetStringsZULm(REALmemoryBlock data, std::int64_t min_length) noexcept {
   if (!data) return nullptr;
   return quietly<REALarray>(nullptr, [&] {
     const rbData block(data);
@@ -178,7 +181,7 @@ REALarray GetStringsZULm(REALmemoryBlock data, int64_t min_length) noexcept {
   });
 }
 
-REALarray GetStringsZULs(REALstring data, int64_t min_length) noexcept {
+REALarray GetStringsZULs(REALstring data, std::int64_t min_length) noexcept {
   if (!data) return nullptr;
   return quietly<REALarray>(nullptr, [&] {
     const rbData s(data);

@@ -9,6 +9,7 @@
 #include <cstring>
 
 #include "common/hex_digits.h"
+#include "common/size_gate.h"
 
 namespace zul::encodings {
 namespace {
@@ -61,14 +62,33 @@ constexpr std::array<bool, 256> kKeep = [] {
   return keep;
 }();
 
+// The exact encoded size of in, counted only when its worst case passes the
+// limit; 0 (with the output's size unknown) once the count passes it.
+std::uint64_t encoded_size(const escape_table& table, std::string_view in, std::uint64_t limit) {
+  std::uint64_t total = 0;
+  for (const char c : in) {
+    total += table[static_cast<std::uint8_t>(c)].length;
+    if (total > limit) return 0;
+  }
+  return total;
+}
+
 }  // namespace
 
-std::string encode_url(std::string_view in, std::int64_t options) {
+std::string encode_url(std::string_view in, std::int64_t options, std::uint64_t limit) {
   const escape_table& table = table_for(options);
   const auto* p = reinterpret_cast<const std::uint8_t*>(in.data());
   const std::size_t n = in.size();
-  // 3 bytes per input byte, plus slack so each entry can be stored as 4.
-  std::string out(3 * n + 10, '\0');
+  // 3 bytes per input byte. Only when that worst case passes the limit is the
+  // exact size counted first; an output past the limit is never allocated.
+  std::uint64_t room = result_size(limit).add_times(3, n).bytes();
+  if (room == 0 && n != 0) {
+    if (!fits_result(n, limit)) return {};  // every byte gives at least one
+    room = encoded_size(table, in, limit);
+    if (room == 0) return {};
+  }
+  // Slack so each entry can be stored as 4 bytes.
+  std::string out(room + 10, '\0');
   char* o = out.data();
   std::size_t i = 0;
   while (i < n) {

@@ -44,7 +44,6 @@ class rbText {
   }
 
   bool is_ascii() const { return is_ascii_; }
-  bool host_failed() const { return host_failed_; }
 
  private:
   enum Slot { kASCII = 0, kUTF8 = 1, kUTF16 = 2, kUTF32 = 3, kSlots = 4 };

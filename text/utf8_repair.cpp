@@ -5,11 +5,11 @@
 // per-position reference (tests/reference/utf8_repair_reference.h).
 #include "text/utf8_repair.h"
 
+#include <algorithm>
 #include <array>
 #include <cstring>
-#include <limits>
-#include <stdexcept>
 
+#include "common/size_gate.h"
 #include "common/utf8.h"
 
 namespace zul::text {
@@ -17,9 +17,9 @@ namespace {
 
 constexpr std::uint64_t kHighBits = 0x8080808080808080ull;
 
-std::size_t reserve_size(std::size_t n) {
-  if (n > std::numeric_limits<std::size_t>::max() - 4096) throw std::length_error("utf8 repair");
-  return n + 4096;
+// Each byte is kept or replaced: the worst case, capped at the limit.
+std::size_t reserve_size(std::size_t n, std::string_view placeholder, std::uint64_t limit) {
+  return worst_case_reserve(n, std::max<std::size_t>(placeholder.size(), 1), 0, limit);
 }
 
 }  // namespace
@@ -53,15 +53,17 @@ std::size_t well_formed_prefix(bytes_view bytes) noexcept {
   return n;
 }
 
-std::string repair_utf8(bytes_view bytes, std::string_view placeholder) {
+std::string repair_utf8(bytes_view bytes, std::string_view placeholder, std::uint64_t limit) {
   std::string out;
-  out.reserve(reserve_size(bytes.size()));
+  out.reserve(reserve_size(bytes.size(), placeholder, limit));
   std::size_t i = 0;
   while (i < bytes.size()) {
     const std::size_t run = well_formed_prefix(bytes.subspan(i));
+    if (!make_room(out, run, limit)) return {};
     out.append(reinterpret_cast<const char*>(bytes.data() + i), run);
     i += run;
     if (i == bytes.size()) break;
+    if (!make_room(out, placeholder.size(), limit)) return {};
     out.append(placeholder);
     ++i;
   }

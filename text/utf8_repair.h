@@ -12,6 +12,7 @@
 #include <string_view>
 
 #include "common/bytes.h"
+#include "common/size_gate.h"
 
 namespace zul::text {
 
@@ -22,8 +23,10 @@ std::size_t well_formed_prefix(bytes_view bytes) noexcept;
 
 // bytes with each byte that begins no well-formed sequence replaced by
 // placeholder (an empty placeholder drops such bytes). The output is
-// reserved once at bytes.size() + 4096 bytes. Throws std::bad_alloc or
-// std::length_error when the output cannot be allocated.
-std::string repair_utf8(bytes_view bytes, std::string_view placeholder);
+// reserved once for the worst case, capped at limit; output that would pass
+// limit bytes gives "" and the repair stops there. Throws std::bad_alloc
+// when the output cannot be allocated.
+std::string repair_utf8(bytes_view bytes, std::string_view placeholder,
+                        std::uint64_t limit = kMaxResultBytes);
 
 }  // namespace zul::text
