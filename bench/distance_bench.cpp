@@ -10,6 +10,7 @@
 #include <vector>
 
 #include "search/distance.h"
+#include "tests/reference/utf8_reference.h"
 #include "text/char_class.h"
 #include "text/utf8_repair.h"
 
@@ -93,7 +94,7 @@ BENCHMARK(BM_repair_utf8)->Arg(0)->Arg(1);
 void BM_repair_utf8_scalar(benchmark::State& state) {
   const std::string& in = utf8_text(static_cast<int>(state.range(0)));
   for (auto _ : state)
-    benchmark::DoNotOptimize(zul::text::detail::repair_utf8_scalar(bytes(in), "?"));
+    benchmark::DoNotOptimize(zul::reference::repair_utf8_reference(bytes(in), "?"));
   state.SetBytesProcessed(state.iterations() * static_cast<std::int64_t>(in.size()));
 }
 BENCHMARK(BM_repair_utf8_scalar)->Arg(0)->Arg(1);

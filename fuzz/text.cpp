@@ -21,6 +21,7 @@
 
 #include "fuzz/fuzz_check.h"
 #include "search/distance.h"
+#include "tests/reference/utf8_reference.h"
 #include "text/char_class.h"
 #include "text/latin1.h"
 #include "text/number_format.h"
@@ -42,8 +43,12 @@ std::string handle_bytes(const owned_handle& h) {
 void check_repair(std::span<const std::uint8_t> data, std::uint8_t knob) {
   static constexpr std::string_view kPlaceholders[] = {"", "?", "\xEF\xBF\xBD", "\xFF"};
   const std::string_view placeholder = kPlaceholders[knob % 4];
-  const std::string repaired = repair_utf8(data, placeholder);
-  check(repaired == detail::repair_utf8_scalar(data, placeholder));
+  const std::string want = zul::reference::repair_utf8_reference(data, placeholder);
+  for (const zul::simd::isa level : zul::simd::supported_isas()) {
+    check(repair_utf8(data, placeholder, zul::simd::kernels_for(zul::simd::utf8_tables(), level))
+              .view() == want);
+  }
+  const std::string& repaired = want;
   if (knob % 4 != 3) check(well_formed_prefix(bytes_of(repaired)) == repaired.size());
   check(well_formed_prefix(data) <= data.size());
 }

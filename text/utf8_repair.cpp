@@ -1,142 +1,97 @@
-// UTF-8 repair in one forward pass: well_formed_prefix runs over the valid
-// stretch (eight ASCII bytes per step, then one table look-up per lead byte)
-// and the stretch is appended in one copy; only the byte where it stopped is
-// replaced, and the scan resumes right after it. The per-position reference
-// follows the well-formedness table row by row.
+// UTF-8 repair in one forward pass. The block kernel proves whole blocks
+// well formed and copies them to the output as it goes; where it stops, the
+// byte rules walk on to the faulty byte, which alone takes the placeholder,
+// and the block kernel resumes after it. On data dense with faults (a kernel
+// call that gets nothing) the byte rules carry on alone for a stretch, so
+// random bytes do not pay a block check per fault.
 #include "text/utf8_repair.h"
 
-#include <array>
 #include <cstring>
-#include <limits>
-#include <stdexcept>
 
 namespace zul::text {
 namespace {
 
-// One row of the well-formedness table, keyed by the first byte: the length
-// of the sequence (0: the byte begins none) and the range of the second
-// byte. Third and fourth bytes are always 80..BF.
-struct lead_row {
-  std::uint8_t length;
-  std::uint8_t second_low;
-  std::uint8_t second_high;
-};
-
-constexpr std::array<lead_row, 256> make_lead_table() {
-  std::array<lead_row, 256> t{};
-  for (int c = 0x00; c <= 0x7F; ++c) t[c] = {1, 0, 0};
-  for (int c = 0xC2; c <= 0xDF; ++c) t[c] = {2, 0x80, 0xBF};
-  t[0xE0] = {3, 0xA0, 0xBF};
-  for (int c = 0xE1; c <= 0xEC; ++c) t[c] = {3, 0x80, 0xBF};
-  t[0xED] = {3, 0x80, 0x9F};
-  t[0xEE] = t[0xEF] = {3, 0x80, 0xBF};
-  t[0xF0] = {4, 0x90, 0xBF};
-  for (int c = 0xF1; c <= 0xF3; ++c) t[c] = {4, 0x80, 0xBF};
-  t[0xF4] = {4, 0x80, 0x8F};
-  return t;
-}
-constexpr std::array<lead_row, 256> kLeadTable = make_lead_table();
-
-constexpr std::uint64_t kHighBits = 0x8080808080808080ull;
+constexpr std::size_t kBlock = 64;           // least progress that makes a kernel call pay
+constexpr std::size_t kScalarStretch = 256;  // scalar-only bytes after a short kernel call
 
 bool in(std::uint8_t c, std::uint8_t low, std::uint8_t high) { return c >= low && c <= high; }
-
-std::size_t reserve_size(std::size_t n) {
-  if (n > std::numeric_limits<std::size_t>::max() - 4096) throw std::length_error("utf8 repair");
-  return n + 4096;
-}
 
 }  // namespace
 
 std::size_t well_formed_length(bytes_view b) noexcept {
   if (b.empty()) return 0;
   const std::uint8_t c = b[0];
-  std::size_t length;
-  std::uint8_t low = 0x80, high = 0xBF;  // range of the second byte
   if (c <= 0x7F) return 1;
-  if (in(c, 0xC2, 0xDF)) {
-    length = 2;
-  } else if (in(c, 0xE0, 0xEF)) {
-    length = 3;
-    if (c == 0xE0) low = 0xA0;
-    if (c == 0xED) high = 0x9F;
-  } else if (in(c, 0xF0, 0xF4)) {
-    length = 4;
-    if (c == 0xF0) low = 0x90;
-    if (c == 0xF4) high = 0x8F;
-  } else {
-    return 0;  // 80..C1 and F5..FF begin nothing
-  }
-  if (b.size() < length || !in(b[1], low, high)) return 0;
-  for (std::size_t k = 2; k < length; ++k) {
+  const utf8_lead row = kUtf8Lead[c];
+  if (row.length == 0 || b.size() < row.length) return 0;
+  if (!in(b[1], row.second_low, row.second_high)) return 0;
+  for (std::size_t k = 2; k < row.length; ++k) {
     if (!in(b[k], 0x80, 0xBF)) return 0;
   }
-  return length;
+  return row.length;
 }
 
 std::size_t well_formed_prefix(bytes_view bytes) noexcept {
+  return utf8_scan(bytes.data(), 0, bytes.size(), bytes.size());
+}
+
+out_buffer repair_utf8(bytes_view bytes, std::string_view placeholder,
+                       const simd::utf8_kernels& kernels) {
   const std::uint8_t* const p = bytes.data();
   const std::size_t n = bytes.size();
+  out_buffer out(n > kResultLimit ? kResultLimit : n + 4096);
+  // Placeholders of up to four bytes are written as one fixed four-byte
+  // store (the room below allows for the overhang).
+  const std::size_t ph_size = placeholder.size();
+  std::uint8_t ph4[4] = {};
+  if (ph_size <= 4) std::memcpy(ph4, placeholder.data(), ph_size);
+  const std::size_t per_byte = ph_size > 4 ? ph_size : 4;  // most output per input byte
   std::size_t i = 0;
+  std::size_t kernel_from = 0;  // the kernel runs again from this offset
   while (i < n) {
-    // Sixteen bytes at a time while none has its high bit set.
-    while (i + 16 <= n) {
-      std::uint64_t w0, w1;
-      std::memcpy(&w0, p + i, 8);
-      std::memcpy(&w1, p + i + 8, 8);
-      if ((w0 | w1) & kHighBits) break;
-      i += 16;
+    if (i >= kernel_from && n - i >= kBlock) {
+      out.ensure(n - i);  // the kernel may write whole blocks up to the end
+      const std::size_t got = kernels.copy_valid(p + i, n - i, out.tail());
+      out.commit(got);
+      i += got;
+      if (got == 0) kernel_from = i + kScalarStretch;
     }
-    if (i >= n) break;
-    const std::uint8_t c = p[i];
-    if (c < 0x80) {
+    // Byte rules from i: up to the first fault when the kernel may resume,
+    // through every fault of the stretch otherwise.
+    const bool stretch = i < kernel_from;
+    std::size_t limit = stretch ? kernel_from : i + kBlock;
+    if (limit > n) limit = n;
+    out.ensure((limit - i + 3) * per_byte);
+    std::uint8_t* const first = out.tail();
+    std::uint8_t* o = first;
+    while (i < limit) {
+      const std::uint8_t c = p[i];
+      if (c < 0x80) {
+        *o++ = c;
+        ++i;
+        continue;
+      }
+      const utf8_lead row = kUtf8Lead[c];
+      if (row.length != 0 && n - i >= row.length && in(p[i + 1], row.second_low, row.second_high) &&
+          (row.length < 3 || (p[i + 2] & 0xC0) == 0x80) &&
+          (row.length < 4 || (p[i + 3] & 0xC0) == 0x80)) {
+        std::memcpy(o, p + i, row.length);
+        o += row.length;
+        i += row.length;
+        continue;
+      }
+      if (ph_size <= 4) {
+        std::memcpy(o, ph4, 4);
+      } else {
+        std::memcpy(o, placeholder.data(), ph_size);
+      }
+      o += ph_size;
       ++i;
-      continue;
+      if (!stretch) break;
     }
-    const lead_row row = kLeadTable[c];
-    if (row.length == 0 || n - i < row.length) return i;
-    if (p[i + 1] < row.second_low || p[i + 1] > row.second_high) return i;
-    if (row.length >= 3 && (p[i + 2] & 0xC0) != 0x80) return i;
-    if (row.length == 4 && (p[i + 3] & 0xC0) != 0x80) return i;
-    i += row.length;
-  }
-  return n;
-}
-
-std::string repair_utf8(bytes_view bytes, std::string_view placeholder) {
-  std::string out;
-  out.reserve(reserve_size(bytes.size()));
-  std::size_t i = 0;
-  while (i < bytes.size()) {
-    const std::size_t run = well_formed_prefix(bytes.subspan(i));
-    out.append(reinterpret_cast<const char*>(bytes.data() + i), run);
-    i += run;
-    if (i == bytes.size()) break;
-    out.append(placeholder);
-    ++i;
+    out.commit(static_cast<std::size_t>(o - first));
   }
   return out;
 }
-
-namespace detail {
-
-std::string repair_utf8_scalar(bytes_view bytes, std::string_view placeholder) {
-  std::string out;
-  out.reserve(reserve_size(bytes.size()));
-  std::size_t i = 0;
-  while (i < bytes.size()) {
-    const std::size_t length = well_formed_length(bytes.subspan(i));
-    if (length == 0) {
-      out.append(placeholder);
-      ++i;
-    } else {
-      out.append(reinterpret_cast<const char*>(bytes.data() + i), length);
-      i += length;
-    }
-  }
-  return out;
-}
-
-}  // namespace detail
 
 }  // namespace zul::text

@@ -11,6 +11,9 @@
 #include <string>
 #include <string_view>
 
+#include "common/out_buffer.h"
+#include "common/utf8_valid.h"
+
 namespace zul::text {
 
 using bytes_view = std::span<const std::uint8_t>;
@@ -22,18 +25,16 @@ std::size_t well_formed_length(bytes_view bytes) noexcept;
 
 // Length of the longest prefix of bytes made of whole well-formed sequences:
 // the offset of the first byte that begins no well-formed sequence, or
-// bytes.size() when there is none. Skips ASCII a word at a time.
+// bytes.size() when there is none.
 std::size_t well_formed_prefix(bytes_view bytes) noexcept;
 
 // bytes with each byte that begins no well-formed sequence replaced by
-// placeholder (an empty placeholder drops such bytes). The output is
-// reserved once at bytes.size() + 4096 bytes. Throws std::bad_alloc or
-// std::length_error when the output cannot be allocated.
-std::string repair_utf8(bytes_view bytes, std::string_view placeholder);
-
-namespace detail {
-// Reference version: judges every position with well_formed_length.
-std::string repair_utf8_scalar(bytes_view bytes, std::string_view placeholder);
-}  // namespace detail
+// placeholder (an empty placeholder drops such bytes), using the block
+// kernels of the given level. The output is reserved once at bytes.size() +
+// 4096 bytes and grows only when placeholders outgrow that. Throws
+// std::bad_alloc when the output cannot be allocated or would pass
+// 0x7FFFFFFF bytes.
+out_buffer repair_utf8(bytes_view bytes, std::string_view placeholder,
+                       const simd::utf8_kernels& kernels = simd::utf8_active());
 
 }  // namespace zul::text

@@ -1,0 +1,111 @@
+// Codecs and transcoding beside memcpy of the same size in the same run, so
+// each figure reads as a share of memory speed. Inputs: text that needs no
+// change, typical text (about one byte in 96 needing work) and worst-case
+// text (every byte needing work), at 1 KiB, 1 MiB and 64 MiB. UTF-8 repair
+// runs at every kernel level the machine has (scalar is the previous
+// prefix-skipping repair). Calls the pure workers: no host in the loop.
+#include <benchmark/benchmark.h>
+
+#include <cstdint>
+#include <cstring>
+#include <map>
+#include <random>
+#include <string>
+#include <vector>
+
+#include "common/bytes.h"
+#include "common/cpu.h"
+#include "text/utf8_repair.h"
+
+namespace {
+
+void sizes(benchmark::internal::Benchmark* b) { b->Arg(1 << 10)->Arg(1 << 20)->Arg(64 << 20); }
+
+void BM_memcpy(benchmark::State& state) {
+  const std::size_t n = static_cast<std::size_t>(state.range(0));
+  std::vector<char> from(n, 'x'), to(n);
+  for (auto _ : state) {
+    std::memcpy(to.data(), from.data(), n);
+    benchmark::DoNotOptimize(to.data());
+    benchmark::ClobberMemory();
+  }
+  state.SetBytesProcessed(static_cast<std::int64_t>(state.iterations()) * state.range(0));
+}
+BENCHMARK(BM_memcpy)->Apply(sizes);
+
+// Repeats pieces (chosen by a fixed random sequence) up to size bytes.
+std::string repeat_pieces(std::size_t size, std::initializer_list<std::string_view> pieces,
+                          unsigned seed) {
+  std::vector<std::string_view> list(pieces);
+  std::mt19937 rng(seed);
+  std::string s;
+  s.reserve(size + 64);
+  while (s.size() < size) s += list[rng() % list.size()];
+  s.resize(size);
+  return s;
+}
+
+enum utf8_input { kAscii, kMixed, kTypical, kRandom, kWorst };
+
+// ASCII prose; valid text with about 38% of its bytes non-ASCII; the same
+// with one stray byte in 96; random bytes; all bytes invalid.
+const std::string& utf8_input_of(utf8_input kind, std::size_t size) {
+  static std::map<std::pair<int, std::size_t>, std::string> cache;
+  auto [it, fresh] = cache.try_emplace({kind, size});
+  if (!fresh) return it->second;
+  std::string& s = it->second;
+  switch (kind) {
+    case kAscii:
+      s = repeat_pieces(size, {"plain ", "text ", "line\n", "of words, "}, 1);
+      break;
+    case kMixed:
+    case kTypical:
+      s = repeat_pieces(size,
+                        {"plain ", "caf\xC3\xA9 ", "\xD1\x82\xD0\xB5\xD0\xBA\xD1\x81\xD1\x82 ",
+                         "\xE2\x82\xAC", "\xF0\x9F\x98\x80 ", "words ", "more "},
+                        2);
+      if (kind == kTypical) {
+        for (std::size_t i = 95; i < s.size(); i += 96) {
+          if (static_cast<unsigned char>(s[i]) < 0x80) s[i] = '\xFF';
+        }
+      }
+      break;
+    case kRandom: {
+      std::mt19937 rng(3);
+      s.resize(size);
+      for (char& c : s) c = static_cast<char>(rng());
+      break;
+    }
+    case kWorst:
+      s.assign(size, '\xFF');
+      break;
+  }
+  return s;
+}
+
+void BM_repair_utf8(benchmark::State& state, utf8_input kind, zul::simd::isa level) {
+  const std::string& in = utf8_input_of(kind, static_cast<std::size_t>(state.range(0)));
+  const auto& kernels = zul::simd::kernels_for(zul::simd::utf8_tables(), level);
+  for (auto _ : state) {
+    benchmark::DoNotOptimize(zul::text::repair_utf8(zul::bytes_of(in), "?", kernels));
+  }
+  state.SetBytesProcessed(static_cast<std::int64_t>(state.iterations()) * state.range(0));
+}
+
+const bool registered = [] {
+  const std::pair<utf8_input, const char*> inputs[] = {{kAscii, "ascii"},
+                                                       {kMixed, "mixed"},
+                                                       {kTypical, "typical"},
+                                                       {kRandom, "random"},
+                                                       {kWorst, "worst"}};
+  for (const auto& [kind, name] : inputs) {
+    for (const zul::simd::isa level : zul::simd::supported_isas()) {
+      const std::string label =
+          std::string("BM_repair_utf8/") + name + "/" + zul::simd::isa_name(level);
+      benchmark::RegisterBenchmark(label.c_str(), BM_repair_utf8, kind, level)->Apply(sizes);
+    }
+  }
+  return true;
+}();
+
+}  // namespace
