@@ -2,8 +2,9 @@
 // through rbData / rbText holders, calls the pure worker and builds the host
 // result. Results of raw bytes carry the unknown encoding 0xFFFF (so the
 // builder marks all-ASCII results ASCII); hex text is ASCII; readable runs
-// are UTF-8. Failed allocations give the empty result, silently, except in
-// CreateStringZUL and HexstringZUL, which raise through the shared trap.
+// are UTF-8. Every function runs inside the silent policy (a failed
+// allocation gives the empty result) except CreateStringZUL and HexstringZUL,
+// which raise through the shared trap.
 #include <array>
 #include <cstdint>
 #include <limits>
@@ -37,31 +38,26 @@ REALstring build_bytes(std::string_view bytes) { return build_string(bytes, kUnk
 
 REALstring concat(REALstring a, REALstring b, REALstring c, REALstring d, REALstring e,
                   REALstring f) {
-  return quietly<REALstring>(nullptr, [&] {
-    const rbData ra(a), rb(b), rc(c), rd(d), re(e), rf(f);
-    const std::array parts = {ra.bytes(), rb.bytes(), rc.bytes(),
-                              rd.bytes(), re.bytes(), rf.bytes()};
-    return build_bytes(zul::binary::concat_bytes(parts));
-  });
+  const rbData ra(a), rb(b), rc(c), rd(d), re(e), rf(f);
+  const std::array parts = {ra.bytes(), rb.bytes(), rc.bytes(), rd.bytes(), re.bytes(), rf.bytes()};
+  return build_bytes(zul::binary::concat_bytes(parts));
 }
 
 REALarray collect_runs(const void* data, std::int64_t size, std::int64_t min_length) {
   if (size <= 0) return nullptr;
-  return quietly<REALarray>(nullptr, [&] {
-    StringArrayBuilder array;
-    if (data) {
-      const std::span bytes(static_cast<const std::uint8_t*>(data), static_cast<std::size_t>(size));
-      zul::binary::for_each_readable_run(bytes, min_length, [&](std::span<const std::uint8_t> run) {
-        array.append({reinterpret_cast<const char*>(run.data()), run.size()}, kUTF8);
-      });
-    }
-    return array.take();
-  });
+  StringArrayBuilder array;
+  if (data) {
+    const std::span bytes(static_cast<const std::uint8_t*>(data), static_cast<std::size_t>(size));
+    zul::binary::for_each_readable_run(bytes, min_length, [&](std::span<const std::uint8_t> run) {
+      array.append({reinterpret_cast<const char*>(run.data()), run.size()}, kUTF8);
+    });
+  }
+  return array.take();
 }
 
 }  // namespace
 
-REALstring StringAND(REALstring a, REALstring b) {
+REALstring StringAND(REALstring a, REALstring b) noexcept {
   if (!a || !b) return nullptr;
   return quietly<REALstring>(nullptr, [&] {
     const rbData data(a), mask(b);
@@ -69,7 +65,7 @@ REALstring StringAND(REALstring a, REALstring b) {
   });
 }
 
-REALstring StringOR(REALstring a, REALstring b) {
+REALstring StringOR(REALstring a, REALstring b) noexcept {
   if (!a || !b) return nullptr;
   return quietly<REALstring>(nullptr, [&] {
     const rbData data(a), mask(b);
@@ -77,7 +73,7 @@ REALstring StringOR(REALstring a, REALstring b) {
   });
 }
 
-REALstring StringXOR(REALstring data, REALstring mask, int64_t mask_offset) {
+REALstring StringXOR(REALstring data, REALstring mask, int64_t mask_offset) noexcept {
   if (!data || !mask) return nullptr;
   return quietly<REALstring>(nullptr, [&] {
     const rbData d(data), m(mask);
@@ -85,7 +81,7 @@ REALstring StringXOR(REALstring data, REALstring mask, int64_t mask_offset) {
   });
 }
 
-REALstring StringXOR2(REALstring data, REALstring mask, int64_t mask_offset) {
+REALstring StringXOR2(REALstring data, REALstring mask, int64_t mask_offset) noexcept {
   if (!data || !mask) return nullptr;
   return quietly<REALstring>(nullptr, [&] {
     const rbData d(data), m(mask);
@@ -94,24 +90,26 @@ REALstring StringXOR2(REALstring data, REALstring mask, int64_t mask_offset) {
 }
 
 REALstring ConcatBinaryStringsZUL6(REALstring a, REALstring b, REALstring c, REALstring d,
-                                   REALstring e, REALstring f) {
-  return concat(a, b, c, d, e, f);
+                                   REALstring e, REALstring f) noexcept {
+  return quietly<REALstring>(nullptr, [&] { return concat(a, b, c, d, e, f); });
 }
 REALstring ConcatBinaryStringsZUL5(REALstring a, REALstring b, REALstring c, REALstring d,
-                                   REALstring e) {
-  return concat(a, b, c, d, e, nullptr);
+                                   REALstring e) noexcept {
+  return quietly<REALstring>(nullptr, [&] { return concat(a, b, c, d, e, nullptr); });
 }
-REALstring ConcatBinaryStringsZUL4(REALstring a, REALstring b, REALstring c, REALstring d) {
-  return concat(a, b, c, d, nullptr, nullptr);
+REALstring ConcatBinaryStringsZUL4(REALstring a, REALstring b, REALstring c,
+                                   REALstring d) noexcept {
+  return quietly<REALstring>(nullptr, [&] { return concat(a, b, c, d, nullptr, nullptr); });
 }
-REALstring ConcatBinaryStringsZUL3(REALstring a, REALstring b, REALstring c) {
-  return concat(a, b, c, nullptr, nullptr, nullptr);
+REALstring ConcatBinaryStringsZUL3(REALstring a, REALstring b, REALstring c) noexcept {
+  return quietly<REALstring>(nullptr, [&] { return concat(a, b, c, nullptr, nullptr, nullptr); });
 }
-REALstring ConcatBinaryStringsZUL2(REALstring a, REALstring b) {
-  return concat(a, b, nullptr, nullptr, nullptr, nullptr);
+REALstring ConcatBinaryStringsZUL2(REALstring a, REALstring b) noexcept {
+  return quietly<REALstring>(nullptr,
+                             [&] { return concat(a, b, nullptr, nullptr, nullptr, nullptr); });
 }
 
-REALstring CreateStringZUL(int64_t length, REALstring content) {
+REALstring CreateStringZUL(int64_t length, REALstring content) noexcept {
   if (length < 1) return nullptr;
   return trapped<REALstring>(nullptr, [&]() -> REALstring {
     const rbData c(content);
@@ -128,7 +126,7 @@ REALstring CreateStringZUL(int64_t length, REALstring content) {
   });
 }
 
-REALstring RandomBytesStringZUL(int64_t length, signed char ascii) {
+REALstring RandomBytesStringZUL(int64_t length, signed char ascii) noexcept {
   if (length < 1 || length > kMaxResult) return nullptr;
   return quietly<REALstring>(nullptr, [&] {
     const bool as_ascii = ascii != 0;
@@ -137,7 +135,7 @@ REALstring RandomBytesStringZUL(int64_t length, signed char ascii) {
   });
 }
 
-REALstring EncodingToHex(REALstring s) {
+REALstring EncodingToHex(REALstring s) noexcept {
   if (!s) return nullptr;
   return quietly<REALstring>(nullptr, [&]() -> REALstring {
     const rbData in(s);
@@ -146,7 +144,7 @@ REALstring EncodingToHex(REALstring s) {
   });
 }
 
-REALstring DecodingToHex(REALstring s) {
+REALstring DecodingToHex(REALstring s) noexcept {
   return quietly<REALstring>(nullptr, [&]() -> REALstring {
     rbText text(s);
     const std::string_view digits = text.ascii();
@@ -156,7 +154,7 @@ REALstring DecodingToHex(REALstring s) {
 }
 
 REALstring Hexstring(REALstring input, int64_t hexlen, int64_t linelen, REALstring linestart,
-                     REALstring lineend, REALstring spacer, REALstring filler) {
+                     REALstring lineend, REALstring spacer, REALstring filler) noexcept {
   if (!input || hexlen == 0 || linelen == 0) return nullptr;
   return trapped<REALstring>(nullptr, [&] {
     const rbData in(input), fill(filler);
@@ -167,12 +165,12 @@ REALstring Hexstring(REALstring input, int64_t hexlen, int64_t linelen, REALstri
   });
 }
 
-REALarray GetStringsZULp(void* data, int64_t size, int64_t min_length) {
+REALarray GetStringsZULp(void* data, int64_t size, int64_t min_length) noexcept {
   if (size < 0) return nullptr;
-  return collect_runs(data, size, min_length);
+  return quietly<REALarray>(nullptr, [&] { return collect_runs(data, size, min_length); });
 }
 
-REALarray GetStringsZULm(REALmemoryBlock data, int64_t min_length) {
+REALarray GetStringsZULm(REALmemoryBlock data, int64_t min_length) noexcept {
   if (!data) return nullptr;
   return quietly<REALarray>(nullptr, [&] {
     const rbData block(data);
@@ -180,7 +178,7 @@ REALarray GetStringsZULm(REALmemoryBlock data, int64_t min_length) {
   });
 }
 
-REALarray GetStringsZULs(REALstring data, int64_t min_length) {
+REALarray GetStringsZULs(REALstring data, int64_t min_length) noexcept {
   if (!data) return nullptr;
   return quietly<REALarray>(nullptr, [&] {
     const rbData s(data);

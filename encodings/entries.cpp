@@ -2,7 +2,8 @@
 // arguments (rbData for stored bytes, rbText for text in a known form),
 // calls the pure worker and builds the host result with its encoding.
 // Functions whose failures are reported run inside the shared trap; the
-// others give their empty result silently when a buffer cannot be had.
+// others run inside the silent policy and give their empty result when a
+// buffer cannot be had.
 // Nothing here keeps state between calls, so calls from several threads
 // are independent.
 #include <cstdint>
@@ -42,27 +43,29 @@ REALstring build_utf32(const enc::code_points& text) {
 }  // namespace
 
 // URL percent-encoding. Space and "+" follow this call's options only.
-REALstring EncodingToURL2(REALstring s, int64_t options) {
+REALstring EncodingToURL2(REALstring s, int64_t options) noexcept {
   if (!s) return nullptr;
-  rbData in(s);
-  return quietly<REALstring>(
-      nullptr, [&] { return build_string(enc::encode_url(in.view(), options), kASCII); });
+  return quietly<REALstring>(nullptr, [&] {
+    rbData in(s);
+    return build_string(enc::encode_url(in.view(), options), kASCII);
+  });
 }
 
-REALstring EncodingToURL1(REALstring s) { return EncodingToURL2(s, 0); }
+REALstring EncodingToURL1(REALstring s) noexcept { return EncodingToURL2(s, 0); }
 
-REALstring DecodingToURL2(REALstring s, int64_t options) {
+REALstring DecodingToURL2(REALstring s, int64_t options) noexcept {
   if (!s) return nullptr;
-  rbData in(s);
-  if (in.length < 1) return nullptr;
-  return quietly<REALstring>(
-      nullptr, [&] { return build_string(enc::decode_url(in.view(), options), kUnknown); });
+  return quietly<REALstring>(nullptr, [&]() -> REALstring {
+    rbData in(s);
+    if (in.length < 1) return nullptr;
+    return build_string(enc::decode_url(in.view(), options), kUnknown);
+  });
 }
 
-REALstring DecodingToURL1(REALstring s) { return DecodingToURL2(s, 0); }
+REALstring DecodingToURL1(REALstring s) noexcept { return DecodingToURL2(s, 0); }
 
 // HTML character references over the string's code points.
-REALstring EncodingToHTML(REALstring s, int64_t options) {
+REALstring EncodingToHTML(REALstring s, int64_t options) noexcept {
   if (!s) return nullptr;
   return trapped<REALstring>(nullptr, [&]() -> REALstring {
     rbText text(s);
@@ -75,7 +78,7 @@ REALstring EncodingToHTML(REALstring s, int64_t options) {
 }
 
 // Registered as both "DecodingFromHTMLZUL" and "DecodingFromXMLZUL".
-REALstring DecodingToHTML(REALstring s) {
+REALstring DecodingToHTML(REALstring s) noexcept {
   if (!s) return nullptr;
   return trapped<REALstring>(nullptr, [&]() -> REALstring {
     rbText text(s);
@@ -86,7 +89,7 @@ REALstring DecodingToHTML(REALstring s) {
   });
 }
 
-REALstring EncodingToXML(REALstring s, int64_t options) {
+REALstring EncodingToXML(REALstring s, int64_t options) noexcept {
   if (!s) return nullptr;
   return trapped<REALstring>(nullptr, [&]() -> REALstring {
     rbText text(s);
@@ -112,11 +115,15 @@ static bool is_markup_ready(REALstring s) {
   return enc::is_markup_free_ascii(in.view());
 }
 
-bool StringIsHTMLready(REALstring s) { return is_markup_ready(s); }
-bool StringIsXMLready(REALstring s) { return is_markup_ready(s); }
+bool StringIsHTMLready(REALstring s) noexcept {
+  return quietly(false, [&] { return is_markup_ready(s); });
+}
+bool StringIsXMLready(REALstring s) noexcept {
+  return quietly(false, [&] { return is_markup_ready(s); });
+}
 
 // Quoted-printable over the stored bytes.
-REALstring EncodingToQuotedPrintable2(REALstring s, int64_t line_length) {
+REALstring EncodingToQuotedPrintable2(REALstring s, int64_t line_length) noexcept {
   if (!s) return nullptr;
   return trapped<REALstring>(nullptr, [&] {
     rbData in(s);
@@ -124,7 +131,7 @@ REALstring EncodingToQuotedPrintable2(REALstring s, int64_t line_length) {
   });
 }
 
-REALstring DecodingToQuotedPrintable(REALstring s) {
+REALstring DecodingToQuotedPrintable(REALstring s) noexcept {
   if (!s) return nullptr;
   return trapped<REALstring>(nullptr, [&] {
     rbData in(s);
@@ -133,7 +140,7 @@ REALstring DecodingToQuotedPrintable(REALstring s) {
 }
 
 // A subject of printable ASCII (the empty one included) comes back as it is.
-REALstring EncodeEmailSubjectZUL(REALstring s) {
+REALstring EncodeEmailSubjectZUL(REALstring s) noexcept {
   if (!s) return nullptr;
   return trapped<REALstring>(nullptr, [&]() -> REALstring {
     rbText text(s);
@@ -144,30 +151,28 @@ REALstring EncodeEmailSubjectZUL(REALstring s) {
 }
 
 // yEnc data bytes.
-REALstring yDecodeZULs(REALstring data) {
+REALstring yDecodeZULs(REALstring data) noexcept {
   if (!data) return nullptr;
-  rbData in(data);
-  if (in.length < 1) return nullptr;
-  return quietly<REALstring>(nullptr,
-                             [&] { return build_string(enc::decode_yenc(in.view()), kUnknown); });
+  return quietly<REALstring>(nullptr, [&]() -> REALstring {
+    rbData in(data);
+    if (in.length < 1) return nullptr;
+    return build_string(enc::decode_yenc(in.view()), kUnknown);
+  });
 }
 
-REALmemoryBlock yDecodeZULm(REALmemoryBlock data) {
+REALmemoryBlock yDecodeZULm(REALmemoryBlock data) noexcept {
   if (!data) return nullptr;
-  rbData in(data);
-  if (in.length < 1 || !in.data) return nullptr;
-  std::string decoded;
-  if (!quietly(false, [&] {
-        decoded = enc::decode_yenc(in.view());
-        return true;
-      })) {
-    return nullptr;
-  }
-  return REALNewMemoryBlock(static_cast<std::int64_t>(decoded.size()), decoded.data());
+  return quietly<REALmemoryBlock>(nullptr, [&]() -> REALmemoryBlock {
+    rbData in(data);
+    if (in.length < 1 || !in.data) return nullptr;
+    const std::string decoded = enc::decode_yenc(in.view());
+    // The block builder raises its own exception when the block cannot be had.
+    return REALNewMemoryBlock(static_cast<std::int64_t>(decoded.size()), decoded.data());
+  });
 }
 
 // Tag removal over the UTF-8 text; the replacement is read as UTF-8 too.
-REALstring RemoveHTMLTagsWith(REALstring s, REALstring replacement) {
+REALstring RemoveHTMLTagsWith(REALstring s, REALstring replacement) noexcept {
   if (!s) return nullptr;
   return trapped<REALstring>(nullptr, [&] {
     rbText text(s);
@@ -176,20 +181,22 @@ REALstring RemoveHTMLTagsWith(REALstring s, REALstring replacement) {
   });
 }
 
-REALstring RemoveHTMLTags(REALstring s) { return RemoveHTMLTagsWith(s, nullptr); }
+REALstring RemoveHTMLTags(REALstring s) noexcept { return RemoveHTMLTagsWith(s, nullptr); }
 
 // SQL helpers.
-REALstring DecodingFromMySQL(REALstring s) {
+REALstring DecodingFromMySQL(REALstring s) noexcept {
   if (!s) return nullptr;
-  rbData in(s);
-  if (in.length < 1) return nullptr;
-  return quietly<REALstring>(nullptr,
-                             [&] { return build_string(enc::decode_mysql(in.view()), kUnknown); });
+  return quietly<REALstring>(nullptr, [&]() -> REALstring {
+    rbData in(s);
+    if (in.length < 1) return nullptr;
+    return build_string(enc::decode_mysql(in.view()), kUnknown);
+  });
 }
 
-REALstring SQLReplaceBooleanZUL(REALstring sql) {
+REALstring SQLReplaceBooleanZUL(REALstring sql) noexcept {
   if (!sql) return nullptr;
-  rbText text(sql);
-  return quietly<REALstring>(
-      nullptr, [&] { return build_string(enc::replace_sql_booleans(text.utf8()), kUTF8); });
+  return quietly<REALstring>(nullptr, [&] {
+    rbText text(sql);
+    return build_string(enc::replace_sql_booleans(text.utf8()), kUTF8);
+  });
 }
