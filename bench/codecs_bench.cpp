@@ -15,6 +15,7 @@
 
 #include "common/bytes.h"
 #include "common/cpu.h"
+#include "text/latin1.h"
 #include "text/utf8_repair.h"
 
 namespace {
@@ -92,6 +93,90 @@ void BM_repair_utf8(benchmark::State& state, utf8_input kind, zul::simd::isa lev
   state.SetBytesProcessed(static_cast<std::int64_t>(state.iterations()) * state.range(0));
 }
 
+// Western text for the single-byte sets: Latin-1 letters throughout; in the
+// typical text one unit in 96 is a Windows-1252 sign (a quote or the euro);
+// in the worst case every unit needs the table (signs, and Greek that is
+// dropped).
+enum charset_input { kPlain, kSigns, kAllSigns };
+
+const std::u16string& charset_text(charset_input kind, std::size_t units) {
+  static std::map<std::pair<int, std::size_t>, std::u16string> cache;
+  auto [it, fresh] = cache.try_emplace({kind, units});
+  if (!fresh) return it->second;
+  std::u16string& s = it->second;
+  static constexpr std::u16string_view kWords = u"Caf\u00E9 cr\u00E8me na\u00EFve and more. ";
+  while (s.size() < units) s += kWords;
+  s.resize(units);
+  if (kind == kSigns) {
+    for (std::size_t i = 95; i < s.size(); i += 96) s[i] = i % 192 == 95 ? u'\u20AC' : u'\u2019';
+  } else if (kind == kAllSigns) {
+    for (std::size_t i = 0; i < s.size(); ++i) s[i] = i % 2 ? u'\u201C' : u'\u03A9';
+  }
+  return s;
+}
+
+// The same texts as Windows-1252 bytes (the scalar encoder makes them).
+const std::string& charset_bytes(charset_input kind, std::size_t size) {
+  static std::map<std::pair<int, std::size_t>, std::string> cache;
+  auto [it, fresh] = cache.try_emplace({kind, size});
+  if (fresh) {
+    const std::u16string& text = charset_text(kind, size);
+    std::string& s = it->second;
+    s.resize(size);
+    for (std::size_t i = 0; i < size; ++i) {
+      const int b = zul::text::byte_for_unit(zul::text::kWindows1252, text[i]);
+      s[i] = static_cast<char>(b < 0 ? 0x81 : b);
+    }
+  }
+  return it->second;
+}
+
+// Bytes processed: the single-byte side (one byte per unit), so the figures
+// of both directions compare with memcpy of the same byte count.
+void BM_decode_cp1252(benchmark::State& state, charset_input kind, zul::simd::isa level) {
+  const std::string& in = charset_bytes(kind, static_cast<std::size_t>(state.range(0)));
+  const auto& kernels = zul::simd::kernels_for(zul::text::single_byte_tables(), level);
+  for (auto _ : state) {
+    benchmark::DoNotOptimize(zul::text::decode_single_byte(
+        zul::bytes_of(in), zul::text::kWindows1252, zul::text::kHandleLimit, kernels));
+  }
+  state.SetBytesProcessed(static_cast<std::int64_t>(state.iterations()) * state.range(0));
+}
+
+void BM_encode_cp1252(benchmark::State& state, charset_input kind, zul::simd::isa level) {
+  const std::u16string& text = charset_text(kind, static_cast<std::size_t>(state.range(0)));
+  const std::span<const std::uint16_t> units(reinterpret_cast<const std::uint16_t*>(text.data()),
+                                             text.size());
+  const auto& kernels = zul::simd::kernels_for(zul::text::single_byte_tables(), level);
+  for (auto _ : state) {
+    benchmark::DoNotOptimize(zul::text::encode_single_byte(units, zul::text::kWindows1252,
+                                                           zul::text::kHandleLimit, kernels));
+  }
+  state.SetBytesProcessed(static_cast<std::int64_t>(state.iterations()) * state.range(0));
+}
+
+void BM_decode_iso8859(benchmark::State& state, zul::simd::isa level) {
+  const std::string& in = charset_bytes(kSigns, static_cast<std::size_t>(state.range(0)));
+  const auto& kernels = zul::simd::kernels_for(zul::text::single_byte_tables(), level);
+  for (auto _ : state) {
+    benchmark::DoNotOptimize(zul::text::decode_single_byte(zul::bytes_of(in), zul::text::kISO8859_1,
+                                                           zul::text::kHandleLimit, kernels));
+  }
+  state.SetBytesProcessed(static_cast<std::int64_t>(state.iterations()) * state.range(0));
+}
+
+void BM_encode_iso8859(benchmark::State& state, charset_input kind, zul::simd::isa level) {
+  const std::u16string& text = charset_text(kind, static_cast<std::size_t>(state.range(0)));
+  const std::span<const std::uint16_t> units(reinterpret_cast<const std::uint16_t*>(text.data()),
+                                             text.size());
+  const auto& kernels = zul::simd::kernels_for(zul::text::single_byte_tables(), level);
+  for (auto _ : state) {
+    benchmark::DoNotOptimize(zul::text::encode_single_byte(units, zul::text::kISO8859_1,
+                                                           zul::text::kHandleLimit, kernels));
+  }
+  state.SetBytesProcessed(static_cast<std::int64_t>(state.iterations()) * state.range(0));
+}
+
 const bool registered = [] {
   const std::pair<utf8_input, const char*> inputs[] = {{kAscii, "ascii"},
                                                        {kMixed, "mixed"},
@@ -104,6 +189,25 @@ const bool registered = [] {
           std::string("BM_repair_utf8/") + name + "/" + zul::simd::isa_name(level);
       benchmark::RegisterBenchmark(label.c_str(), BM_repair_utf8, kind, level)->Apply(sizes);
     }
+  }
+  const std::pair<charset_input, const char*> charset_inputs[] = {
+      {kPlain, "plain"}, {kSigns, "typical"}, {kAllSigns, "worst"}};
+  for (const zul::simd::isa level : zul::simd::supported_isas()) {
+    const std::string isa = zul::simd::isa_name(level);
+    for (const auto& [kind, name] : charset_inputs) {
+      benchmark::RegisterBenchmark(("BM_decode_cp1252/" + std::string(name) + "/" + isa).c_str(),
+                                   BM_decode_cp1252, kind, level)
+          ->Apply(sizes);
+      benchmark::RegisterBenchmark(("BM_encode_cp1252/" + std::string(name) + "/" + isa).c_str(),
+                                   BM_encode_cp1252, kind, level)
+          ->Apply(sizes);
+      benchmark::RegisterBenchmark(("BM_encode_iso8859/" + std::string(name) + "/" + isa).c_str(),
+                                   BM_encode_iso8859, kind, level)
+          ->Apply(sizes);
+    }
+    benchmark::RegisterBenchmark(("BM_decode_iso8859/typical/" + isa).c_str(), BM_decode_iso8859,
+                                 level)
+        ->Apply(sizes);
   }
   return true;
 }();

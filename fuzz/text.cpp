@@ -75,10 +75,20 @@ std::vector<std::uint16_t> units_of(std::string_view bytes) {
 void check_single_byte(std::span<const std::uint8_t> data) {
   const std::vector<std::uint16_t> units =
       units_of({reinterpret_cast<const char*>(data.data()), data.size()});
-  check(handle_bytes(encode_single_byte(units, kISO8859_1)) ==
-        handle_bytes(detail::encode_single_byte_scalar(units, escapecharsISO8859)));
-  check(handle_bytes(encode_single_byte(units, kWindows1252)) ==
-        handle_bytes(detail::encode_single_byte_scalar(units, escapecharsCP1252)));
+  for (const zul::simd::isa level : zul::simd::supported_isas()) {
+    const single_byte_kernels& kernels = zul::simd::kernels_for(single_byte_tables(), level);
+    check(handle_bytes(encode_single_byte(units, kISO8859_1, kHandleLimit, kernels)) ==
+          handle_bytes(detail::encode_single_byte_scalar(units, escapecharsISO8859)));
+    check(handle_bytes(encode_single_byte(units, kWindows1252, kHandleLimit, kernels)) ==
+          handle_bytes(detail::encode_single_byte_scalar(units, escapecharsCP1252)));
+    const owned_handle decoded = decode_single_byte(data, kWindows1252, kHandleLimit, kernels);
+    const std::string got = handle_bytes(decoded);
+    for (std::size_t i = 0; i < data.size(); ++i) {
+      std::uint16_t unit;
+      std::memcpy(&unit, got.data() + 2 * i, 2);
+      check(unit == escapecharsCP1252[data[i]]);
+    }
+  }
   const owned_handle wide = decode_single_byte(data, kISO8859_1);
   const std::vector<std::uint16_t> back = units_of(handle_bytes(wide));
   check(handle_bytes(encode_single_byte(back, kISO8859_1)) ==
