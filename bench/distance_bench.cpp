@@ -10,7 +10,8 @@
 #include <vector>
 
 #include "search/distance.h"
-#include "tests/reference/utf8_reference.h"
+#include "tests/reference/char_class_reference.h"
+#include "tests/reference/utf8_repair_reference.h"
 #include "text/char_class.h"
 #include "text/utf8_repair.h"
 
@@ -80,7 +81,7 @@ const std::string& utf8_text(int kind) {
   return texts[static_cast<std::size_t>(kind)];
 }
 
-zul::text::bytes_view bytes(const std::string& s) {
+zul::bytes_view bytes(const std::string& s) {
   return {reinterpret_cast<const std::uint8_t*>(s.data()), s.size()};
 }
 
@@ -112,7 +113,7 @@ void BM_all_bytes_in_scalar(benchmark::State& state) {
   const std::string& in = utf8_text(0);
   for (auto _ : state) {
     benchmark::DoNotOptimize(
-        zul::text::detail::all_bytes_in_scalar(bytes(in), zul::text::byte_class::printable));
+        zul::reference::all_bytes_in_reference(bytes(in), zul::text::byte_class::printable));
   }
   state.SetBytesProcessed(state.iterations() * static_cast<std::int64_t>(in.size()));
 }

@@ -9,6 +9,8 @@
 
 #include "encodings/html.h"
 #include "encodings/url.h"
+#include "tests/reference/html_reference.h"
+#include "tests/reference/url_reference.h"
 
 namespace {
 
@@ -72,10 +74,14 @@ void BM_decode_html(benchmark::State& state) {
 void sizes(benchmark::internal::Benchmark* b) { b->Arg(1 << 10)->Arg(1 << 20); }
 
 BENCHMARK(BM_url<enc::encode_url>)->Name("BM_encode_url")->Apply(sizes);
-BENCHMARK(BM_url<enc::detail::encode_url_scalar>)->Name("BM_encode_url_scalar")->Apply(sizes);
+BENCHMARK(BM_url<zul::reference::encode_url_reference>)
+    ->Name("BM_encode_url_reference")
+    ->Apply(sizes);
 BENCHMARK(BM_decode_url)->Apply(sizes);
 BENCHMARK(BM_html<enc::encode_html>)->Name("BM_encode_html")->Apply(sizes);
-BENCHMARK(BM_html<enc::detail::encode_html_scalar>)->Name("BM_encode_html_scalar")->Apply(sizes);
+BENCHMARK(BM_html<zul::reference::encode_html_reference>)
+    ->Name("BM_encode_html_reference")
+    ->Apply(sizes);
 BENCHMARK(BM_decode_html)->Apply(sizes);
 
 }  // namespace

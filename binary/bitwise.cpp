@@ -108,17 +108,6 @@ std::size_t mask_start(std::int64_t offset, std::size_t m) {
   return static_cast<std::size_t>(r < 0 ? r + len : r);
 }
 
-void combine_scalar(bit_op op, bytes_view data, bytes_view mask, std::size_t start,
-                    std::uint8_t* out) {
-  std::size_t k = start;
-  for (std::size_t i = 0; i < data.size(); ++i) {
-    const std::uint8_t d = data[i];
-    const std::uint8_t b = mask[k];
-    out[i] = op == bit_op::kAnd ? (d & b) : op == bit_op::kOr ? (d | b) : (d ^ b);
-    if (++k == mask.size()) k = 0;
-  }
-}
-
 void combine_fast(bit_op op, bytes_view data, bytes_view mask, std::size_t start,
                   std::uint8_t* out) {
   switch (op) {

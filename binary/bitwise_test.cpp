@@ -5,7 +5,10 @@
 
 #include <gtest/gtest.h>
 
+#include <string>
 #include <vector>
+
+#include "tests/reference/bitwise_reference.h"
 
 namespace zul::binary {
 namespace {
@@ -32,8 +35,9 @@ TEST(combine_fast, matches_byte_rule) {
           const bytes_view data(data_pool.data() + skew, n);
           const bytes_view mask(mask_pool.data() + 7 - skew, m);
           for (std::size_t start = 0; start < m; start += (m > 9 ? 7 : 1)) {
-            std::vector<std::uint8_t> want(n + 8, 0xEE), got(n + 8, 0xEE);
-            detail::combine_scalar(op, data, mask, start, want.data());
+            const std::string rule = reference::combine_reference(op, data, mask, start);
+            std::vector<std::uint8_t> want(rule.begin(), rule.end()), got(n + 8, 0xEE);
+            want.resize(n + 8, 0xEE);
             detail::combine_fast(op, data, mask, start, got.data());
             ASSERT_EQ(got, want) << "op " << static_cast<int>(op) << " m " << m << " n " << n
                                  << " start " << start << " skew " << skew;

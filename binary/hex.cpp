@@ -1,12 +1,14 @@
 // Hex encoding turns four bytes at a time into eight digits inside one 64-bit
 // word (SWAR), finishing through a 256-entry table of digit pairs; decoding
-// maps characters through a 256-entry value table in which every non-digit
+// maps characters through the shared value table in which every non-digit
 // is 0.
 #include "binary/hex.h"
 
 #include <array>
 #include <bit>
 #include <cstring>
+
+#include "common/hex_digits.h"
 
 namespace zul::binary {
 namespace {
@@ -16,16 +18,6 @@ constexpr std::array<std::array<char, 2>, 256> kDigitPairs = [] {
   std::array<std::array<char, 2>, 256> pairs{};
   for (std::size_t b = 0; b < 256; ++b) pairs[b] = {kHexDigits[b >> 4], kHexDigits[b & 0x0F]};
   return pairs;
-}();
-
-constexpr std::array<std::uint8_t, 256> kDigitValues = [] {
-  std::array<std::uint8_t, 256> values{};
-  for (int d = 0; d < 10; ++d) values['0' + d] = static_cast<std::uint8_t>(d);
-  for (int d = 0; d < 6; ++d) {
-    values['A' + d] = static_cast<std::uint8_t>(10 + d);
-    values['a' + d] = static_cast<std::uint8_t>(10 + d);
-  }
-  return values;
 }();
 
 constexpr std::uint64_t kLowNibbles = 0x000F000F000F000Full;
@@ -49,19 +41,6 @@ std::uint64_t digits_of_four(const std::uint8_t* in) {
 
 }  // namespace
 
-namespace detail {
-
-std::uint8_t hex_value(char c) { return kDigitValues[static_cast<std::uint8_t>(c)]; }
-
-void encode_hex_scalar(std::span<const std::uint8_t> bytes, char* out) {
-  for (std::uint8_t b : bytes) {
-    *out++ = kHexDigits[b >> 4];
-    *out++ = kHexDigits[b & 0x0F];
-  }
-}
-
-}  // namespace detail
-
 std::string encode_hex(std::span<const std::uint8_t> bytes) {
   std::string out(2 * bytes.size(), '\0');
   char* p = out.data();
@@ -79,7 +58,7 @@ std::string decode_hex(std::string_view text) {
   std::string out(text.size() / 2, '\0');
   const char* p = text.data();
   for (char& b : out) {
-    b = static_cast<char>(detail::hex_value(p[0]) << 4 | detail::hex_value(p[1]));
+    b = static_cast<char>(hex_value(p[0]) << 4 | hex_value(p[1]));
     p += 2;
   }
   return out;

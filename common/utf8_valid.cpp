@@ -23,11 +23,11 @@ std::size_t utf8_scan(const std::uint8_t* p, std::size_t i, std::size_t n,
       ++i;
       continue;
     }
-    const utf8_lead row = kUtf8Lead[c];
+    const utf8_lead row = kUtf8Leads[c];
     if (row.length == 0 || n - i < row.length) return i;
     if (p[i + 1] < row.second_low || p[i + 1] > row.second_high) return i;
-    if (row.length >= 3 && (p[i + 2] & 0xC0) != 0x80) return i;
-    if (row.length == 4 && (p[i + 3] & 0xC0) != 0x80) return i;
+    if (row.length >= 3 && !is_utf8_continuation(p[i + 2])) return i;
+    if (row.length == 4 && !is_utf8_continuation(p[i + 3])) return i;
     i += row.length;
   }
   return i;

@@ -6,37 +6,13 @@
 // than one instruction per byte" (2021), copying each block as they go.
 #pragma once
 
-#include <array>
 #include <cstddef>
 #include <cstdint>
 
 #include "common/dispatch.h"
+#include "common/utf8.h"
 
 namespace zul {
-
-// One row of the well-formedness table, keyed by the first byte: sequence
-// length (0: the byte begins none) and the range of the second byte. Third
-// and fourth bytes are always 80..BF.
-struct utf8_lead {
-  std::uint8_t length;
-  std::uint8_t second_low;
-  std::uint8_t second_high;
-};
-
-constexpr std::array<utf8_lead, 256> make_utf8_lead_table() {
-  std::array<utf8_lead, 256> t{};
-  for (int c = 0x00; c <= 0x7F; ++c) t[c] = {1, 0, 0xFF};
-  for (int c = 0xC2; c <= 0xDF; ++c) t[c] = {2, 0x80, 0xBF};
-  t[0xE0] = {3, 0xA0, 0xBF};
-  for (int c = 0xE1; c <= 0xEC; ++c) t[c] = {3, 0x80, 0xBF};
-  t[0xED] = {3, 0x80, 0x9F};
-  t[0xEE] = t[0xEF] = {3, 0x80, 0xBF};
-  t[0xF0] = {4, 0x90, 0xBF};
-  for (int c = 0xF1; c <= 0xF3; ++c) t[c] = {4, 0x80, 0xBF};
-  t[0xF4] = {4, 0x80, 0x8F};
-  return t;
-}
-inline constexpr std::array<utf8_lead, 256> kUtf8Lead = make_utf8_lead_table();
 
 // Advances from offset i of p[0, n) over whole well-formed sequences while
 // the offset is below limit (limit <= n). Returns where it stopped: at or

@@ -36,6 +36,25 @@ REALstring same_string(REALstring s) {
   return s;
 }
 
+// The stored bytes of s through a byte decoder, as bytes without a declared
+// encoding; no bytes give the null string.
+template <class Decode>
+REALstring decode_stored_bytes(REALstring s, Decode decode) {
+  rbData in(s);
+  if (in.length < 1) return nullptr;
+  return build_string(decode(in.view()), kUnknown);
+}
+
+// fn of the code points of s; no characters give the null string.
+template <class Fn>
+REALstring with_code_points(REALstring s, Fn fn) {
+  rbText text(s);
+  text.ConvertUTF32();
+  const auto chars = text.utf32();
+  if (chars.empty()) return nullptr;
+  return fn(chars);
+}
+
 REALstring build_utf32(const enc::code_points& text) {
   return REALBuildUnicodeString(text.data(), static_cast<std::int64_t>(text.size() * 4), kUTF32);
 }
@@ -55,10 +74,9 @@ REALstring EncodingToURL1(REALstring s) noexcept { return EncodingToURL2(s, 0); 
 
 REALstring DecodingToURL2(REALstring s, int64_t options) noexcept {
   if (!s) return nullptr;
-  return quietly<REALstring>(nullptr, [&]() -> REALstring {
-    rbData in(s);
-    if (in.length < 1) return nullptr;
-    return build_string(enc::decode_url(in.view(), options), kUnknown);
+  return quietly<REALstring>(nullptr, [&] {
+    return decode_stored_bytes(s,
+                               [&](std::string_view in) { return enc::decode_url(in, options); });
   });
 }
 
@@ -67,37 +85,30 @@ REALstring DecodingToURL1(REALstring s) noexcept { return DecodingToURL2(s, 0); 
 // HTML character references over the string's code points.
 REALstring EncodingToHTML(REALstring s, int64_t options) noexcept {
   if (!s) return nullptr;
-  return trapped<REALstring>(nullptr, [&]() -> REALstring {
-    rbText text(s);
-    text.ConvertUTF32();
-    const auto chars = text.utf32();
-    if (chars.empty()) return nullptr;
-    if (!enc::html_needs_escaping(chars)) return same_string(s);
-    return build_string(enc::encode_html(chars, options), kASCII);
+  return trapped<REALstring>(nullptr, [&] {
+    return with_code_points(s, [&](enc::code_point_view chars) {
+      if (!enc::html_needs_escaping(chars)) return same_string(s);
+      return build_string(enc::encode_html(chars, options), kASCII);
+    });
   });
 }
 
 // Registered as both "DecodingFromHTMLZUL" and "DecodingFromXMLZUL".
 REALstring DecodingToHTML(REALstring s) noexcept {
   if (!s) return nullptr;
-  return trapped<REALstring>(nullptr, [&]() -> REALstring {
-    rbText text(s);
-    text.ConvertUTF32();
-    const auto chars = text.utf32();
-    if (chars.empty()) return nullptr;
-    return build_utf32(enc::decode_html(chars));
+  return trapped<REALstring>(nullptr, [&] {
+    return with_code_points(
+        s, [](enc::code_point_view chars) { return build_utf32(enc::decode_html(chars)); });
   });
 }
 
 REALstring EncodingToXML(REALstring s, int64_t options) noexcept {
   if (!s) return nullptr;
-  return trapped<REALstring>(nullptr, [&]() -> REALstring {
-    rbText text(s);
-    text.ConvertUTF32();
-    const auto chars = text.utf32();
-    if (chars.empty()) return nullptr;
-    if (!enc::xml_needs_escaping(chars)) return same_string(s);
-    return build_utf32(enc::encode_xml(chars, options));
+  return trapped<REALstring>(nullptr, [&] {
+    return with_code_points(s, [&](enc::code_point_view chars) {
+      if (!enc::xml_needs_escaping(chars)) return same_string(s);
+      return build_utf32(enc::encode_xml(chars, options));
+    });
   });
 }
 
@@ -153,11 +164,7 @@ REALstring EncodeEmailSubjectZUL(REALstring s) noexcept {
 // yEnc data bytes.
 REALstring yDecodeZULs(REALstring data) noexcept {
   if (!data) return nullptr;
-  return quietly<REALstring>(nullptr, [&]() -> REALstring {
-    rbData in(data);
-    if (in.length < 1) return nullptr;
-    return build_string(enc::decode_yenc(in.view()), kUnknown);
-  });
+  return quietly<REALstring>(nullptr, [&] { return decode_stored_bytes(data, enc::decode_yenc); });
 }
 
 REALmemoryBlock yDecodeZULm(REALmemoryBlock data) noexcept {
@@ -186,11 +193,7 @@ REALstring RemoveHTMLTags(REALstring s) noexcept { return RemoveHTMLTagsWith(s, 
 // SQL helpers.
 REALstring DecodingFromMySQL(REALstring s) noexcept {
   if (!s) return nullptr;
-  return quietly<REALstring>(nullptr, [&]() -> REALstring {
-    rbData in(s);
-    if (in.length < 1) return nullptr;
-    return build_string(enc::decode_mysql(in.view()), kUnknown);
-  });
+  return quietly<REALstring>(nullptr, [&] { return decode_stored_bytes(s, enc::decode_mysql); });
 }
 
 REALstring SQLReplaceBooleanZUL(REALstring sql) noexcept {

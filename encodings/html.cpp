@@ -3,32 +3,18 @@
 // point per character + 4 Ki) and make one pass. The encoder decides every
 // ASCII character from a 128-entry table per mode and looks characters from
 // U+0080 up in the entity index; the decoder copies runs without "&" whole.
-// The scalar versions scan the entity table row by row instead.
+// Row-by-row references live with the tests (tests/reference/).
 #include "encodings/html.h"
 
 #include <array>
 #include <charconv>
 #include <string_view>
 
+#include "common/markup.h"
 #include "encodings/html_entities.h"
 
 namespace zul::encodings {
 namespace {
-
-bool is_byte_order_mark(std::uint32_t c) { return c == 0xFEFF || c == 0xFFFE; }
-
-code_point_view skip_byte_order_mark(code_point_view text) {
-  return !text.empty() && is_byte_order_mark(text[0]) ? text.subspan(1) : text;
-}
-
-// Controls other than tab, LF and CR are dropped from rewritten text.
-constexpr bool is_dropped_control(std::uint32_t c) {
-  return c < 32 && c != 9 && c != 10 && c != 13;
-}
-
-constexpr bool is_markup(std::uint32_t c) {
-  return c == '"' || c == '&' || c == '\'' || c == '<' || c == '>';
-}
 
 void append_numeric_reference(std::string& out, std::uint32_t cp) {
   char digits[10];
@@ -75,10 +61,8 @@ constexpr ascii_actions kEscapeMarkup = make_ascii_actions(true);
 constexpr ascii_actions kKeepMarkup = make_ascii_actions(false);
 
 // The value of a reference name (the characters between "&" and ";"), or
-// nothing when the name is no reference. name_lookup maps an ASCII name to
-// its table code point.
-template <class NameLookup>
-std::optional<std::uint32_t> reference_value(code_point_view name, NameLookup name_lookup) {
+// nothing when the name is no reference.
+std::optional<std::uint32_t> reference_value(code_point_view name) {
   char ascii[8];
   bool all_ascii = true;
   for (std::size_t k = 0; k < name.size(); ++k) {
@@ -86,7 +70,7 @@ std::optional<std::uint32_t> reference_value(code_point_view name, NameLookup na
     ascii[k] = static_cast<char>(name[k]);
   }
   if (all_ascii) {
-    if (auto cp = name_lookup(std::string_view(ascii, name.size()))) return cp;
+    if (auto cp = entity_code_point(std::string_view(ascii, name.size()))) return cp;
   }
   if (name[0] != '#') return std::nullopt;
   const bool hex = name.size() >= 2 && name[1] == 'x';
@@ -112,8 +96,9 @@ std::optional<std::uint32_t> reference_value(code_point_view name, NameLookup na
   return static_cast<std::uint32_t>(value);
 }
 
-template <class NameLookup>
-code_points decode_with(code_point_view text, NameLookup name_lookup) {
+}  // namespace
+
+code_points decode_html(code_point_view text) {
   text = skip_byte_order_mark(text);
   const std::size_t n = text.size();
   code_points out;
@@ -139,7 +124,7 @@ code_points decode_with(code_point_view text, NameLookup name_lookup) {
       }
     }
     if (bounded && length > 0) {
-      if (auto cp = reference_value(text.subspan(i + 1, length), name_lookup)) {
+      if (auto cp = reference_value(text.subspan(i + 1, length))) {
         out.push_back(*cp);
         i += length + 2;
         continue;
@@ -150,8 +135,6 @@ code_points decode_with(code_point_view text, NameLookup name_lookup) {
   }
   return out;
 }
-
-}  // namespace
 
 bool html_needs_escaping(code_point_view text) {
   for (const std::uint32_t c : text) {
@@ -178,34 +161,4 @@ std::string encode_html(code_point_view text, std::int64_t options) {
   return out;
 }
 
-code_points decode_html(code_point_view text) {
-  return decode_with(text, [](std::string_view name) { return entity_code_point(name); });
-}
-
-namespace detail {
-
-std::string encode_html_scalar(code_point_view text, std::int64_t options) {
-  text = skip_byte_order_mark(text);
-  const bool keep_markup = (options & 1) != 0;
-  std::string out;
-  out.reserve(4 * text.size() + 4096);
-  for (const std::uint32_t c : text) {
-    if (!keep_markup && c == '\'') {
-      out += "&#39;";
-    } else if (const std::string_view name = entity_name_scan(c, keep_markup); !name.empty()) {
-      append_named_reference(out, name);
-    } else if (c >= 128) {
-      append_numeric_reference(out, c);
-    } else if (!is_dropped_control(c)) {
-      out += static_cast<char>(c);
-    }
-  }
-  return out;
-}
-
-code_points decode_html_scalar(code_point_view text) {
-  return decode_with(text, [](std::string_view name) { return entity_code_point_scan(name); });
-}
-
-}  // namespace detail
 }  // namespace zul::encodings

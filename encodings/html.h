@@ -36,12 +36,4 @@ std::string encode_html(code_point_view text, std::int64_t options);
 // the digits are ignored). Output is never longer than the input.
 code_points decode_html(code_point_view text);
 
-namespace detail {
-// The encoder with a row-by-row table scan for every character, as the
-// reference for the indexed version.
-std::string encode_html_scalar(code_point_view text, std::int64_t options);
-// The decoder with a row-by-row scan for each candidate name.
-code_points decode_html_scalar(code_point_view text);
-}  // namespace detail
-
 }  // namespace zul::encodings

@@ -4,7 +4,7 @@
 // inside an encoded word.
 #include "encodings/mail_subject.h"
 
-#include "encodings/hex_digits.h"
+#include "common/hex_digits.h"
 
 namespace zul::encodings {
 

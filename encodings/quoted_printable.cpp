@@ -6,7 +6,7 @@
 
 #include <array>
 
-#include "encodings/hex_digits.h"
+#include "common/hex_digits.h"
 
 namespace zul::encodings {
 namespace {

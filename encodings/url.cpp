@@ -8,7 +8,7 @@
 #include <array>
 #include <cstring>
 
-#include "encodings/hex_digits.h"
+#include "common/hex_digits.h"
 
 namespace zul::encodings {
 namespace {
@@ -18,8 +18,6 @@ constexpr bool is_unreserved(unsigned b) {
          b == '*' || b == '-' || b == '.' || b == '@' || b == '_';
 }
 
-bool space_as_plus(std::int64_t options) { return (options & 3) == 1; }
-bool escape_plus(std::int64_t options) { return (options & 3) == 1 || (options & 3) == 2; }
 bool plus_as_space(std::int64_t options) { return (options & 1) != 0; }
 
 // One replacement: its length (1 or 3) and up to 4 bytes written at once.
@@ -120,44 +118,4 @@ std::string decode_url(std::string_view in, std::int64_t options) {
   return out;
 }
 
-namespace detail {
-
-std::string encode_url_scalar(std::string_view in, std::int64_t options) {
-  std::string out;
-  out.reserve(3 * in.size() + 10);
-  for (const char c : in) {
-    const auto b = static_cast<std::uint8_t>(c);
-    if (b == ' ' && space_as_plus(options)) {
-      out += '+';
-    } else if (is_unreserved(b) || (b == '+' && !escape_plus(options))) {
-      out += c;
-    } else {
-      out += '%';
-      out += kHexDigits[b / 16];
-      out += kHexDigits[b % 16];
-    }
-  }
-  return out;
-}
-
-std::string decode_url_scalar(std::string_view in, std::int64_t options) {
-  std::string out;
-  out.reserve(in.size());
-  for (std::size_t i = 0; i < in.size();) {
-    if (in[i] == '%') {
-      const unsigned high = i + 1 < in.size() ? hex_value(in[i + 1]) : 0;
-      const unsigned low = i + 2 < in.size() ? hex_value(in[i + 2]) : 0;
-      out += static_cast<char>((high * 16 + low) & 0xFF);
-      i += 3;
-    } else if (plus_as_space(options) && in[i] == '+') {
-      out += ' ';
-      ++i;
-    } else {
-      out += in[i++];
-    }
-  }
-  return out;
-}
-
-}  // namespace detail
 }  // namespace zul::encodings

@@ -25,11 +25,4 @@ std::string encode_url(std::string_view in, std::int64_t options);
 // at most in.size() bytes.
 std::string decode_url(std::string_view in, std::int64_t options);
 
-namespace detail {
-// Byte-at-a-time versions that follow the rules directly; the table-driven
-// versions above must give the same output.
-std::string encode_url_scalar(std::string_view in, std::int64_t options);
-std::string decode_url_scalar(std::string_view in, std::int64_t options);
-}  // namespace detail
-
 }  // namespace zul::encodings

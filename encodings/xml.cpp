@@ -5,12 +5,10 @@
 
 #include <array>
 
+#include "common/markup.h"
+
 namespace zul::encodings {
 namespace {
-
-constexpr bool is_markup(std::uint32_t c) {
-  return c == '"' || c == '&' || c == '\'' || c == '<' || c == '>';
-}
 
 void append(code_points& out, std::string_view ascii) {
   out.insert(out.end(), ascii.begin(), ascii.end());
@@ -33,7 +31,7 @@ bool xml_needs_escaping(code_point_view text) {
 }
 
 code_points encode_xml(code_point_view text, std::int64_t options) {
-  if (!text.empty() && (text[0] == 0xFEFF || text[0] == 0xFFFE)) text = text.subspan(1);
+  text = skip_byte_order_mark(text);
   const bool named_apostrophe = (options & 1) != 0;
   code_points out;
   out.reserve(text.size() + 4096);
@@ -55,7 +53,7 @@ code_points encode_xml(code_point_view text, std::int64_t options) {
         append(out, "&gt;");
         break;
       default:
-        if (c >= 32 || c == 9 || c == 10 || c == 13) out.push_back(c);
+        if (!is_dropped_control(c)) out.push_back(c);
     }
   }
   return out;

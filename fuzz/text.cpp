@@ -21,7 +21,9 @@
 
 #include "fuzz/fuzz_check.h"
 #include "search/distance.h"
-#include "tests/reference/utf8_reference.h"
+#include "tests/reference/char_class_reference.h"
+#include "tests/reference/latin1_reference.h"
+#include "tests/reference/utf8_repair_reference.h"
 #include "text/char_class.h"
 #include "text/latin1.h"
 #include "text/number_format.h"
@@ -43,19 +45,18 @@ std::string handle_bytes(const owned_handle& h) {
 void check_repair(std::span<const std::uint8_t> data, std::uint8_t knob) {
   static constexpr std::string_view kPlaceholders[] = {"", "?", "\xEF\xBF\xBD", "\xFF"};
   const std::string_view placeholder = kPlaceholders[knob % 4];
-  const std::string want = zul::reference::repair_utf8_reference(data, placeholder);
+  const std::string repaired = zul::reference::repair_utf8_reference(data, placeholder);
   for (const zul::simd::isa level : zul::simd::supported_isas()) {
     check(repair_utf8(data, placeholder, zul::simd::kernels_for(zul::simd::utf8_tables(), level))
-              .view() == want);
+              .view() == repaired);
   }
-  const std::string& repaired = want;
   if (knob % 4 != 3) check(well_formed_prefix(bytes_of(repaired)) == repaired.size());
   check(well_formed_prefix(data) <= data.size());
 }
 
 void check_classes(std::span<const std::uint8_t> data, std::uint8_t replacement) {
   for (auto cls : {byte_class::seven_bit, byte_class::printable, byte_class::non_control}) {
-    check(all_bytes_in(data, cls) == detail::all_bytes_in_scalar(data, cls));
+    check(all_bytes_in(data, cls) == zul::reference::all_bytes_in_reference(data, cls));
   }
   const std::string replaced = replace_non_printable(data, replacement);
   check(replaced.size() == data.size());
@@ -78,14 +79,14 @@ void check_single_byte(std::span<const std::uint8_t> data) {
   for (const zul::simd::isa level : zul::simd::supported_isas()) {
     const single_byte_kernels& kernels = zul::simd::kernels_for(single_byte_tables(), level);
     check(handle_bytes(encode_single_byte(units, kISO8859_1, kHandleLimit, kernels)) ==
-          handle_bytes(detail::encode_single_byte_scalar(units, escapecharsISO8859)));
+          zul::reference::encode_single_byte_reference(units, escapecharsISO8859));
     check(handle_bytes(encode_single_byte(units, kWindows1252, kHandleLimit, kernels)) ==
-          handle_bytes(detail::encode_single_byte_scalar(units, escapecharsCP1252)));
-    const owned_handle decoded = decode_single_byte(data, kWindows1252, kHandleLimit, kernels);
-    const std::string got = handle_bytes(decoded);
+          zul::reference::encode_single_byte_reference(units, escapecharsCP1252));
+    const std::string decoded =
+        handle_bytes(decode_single_byte(data, kWindows1252, kHandleLimit, kernels));
     for (std::size_t i = 0; i < data.size(); ++i) {
       std::uint16_t unit;
-      std::memcpy(&unit, got.data() + 2 * i, 2);
+      std::memcpy(&unit, decoded.data() + 2 * i, 2);
       check(unit == escapecharsCP1252[data[i]]);
     }
   }

@@ -58,6 +58,10 @@ class rbText {
   bool fetch(Slot slot, std::uint32_t encoding, std::size_t unit);
   bool take_copy(Slot slot, const void* src, std::size_t units, std::size_t unit);
   void reset_slot(Slot slot);
+  // Widens the ASCII slot's bytes to units of Unit in the slot (empty when
+  // there are none or no buffer can be had).
+  template <class Unit>
+  void widen_ascii(Slot slot);
   void apply_ascii_shortcut();
   void derive_utf32_from_utf16();
 

@@ -2,8 +2,8 @@
 // table (on the stack, no allocation) so that the scan costs one load per
 // target byte whatever the size of the set; a set of one byte goes to
 // memchr, and small sets (up to three ranges and eight bytes) first skip
-// unmatched 32-byte blocks with vector compares. The scalar versions follow
-// the plain definition and serve as the reference in tests.
+// unmatched 32-byte blocks with vector compares. Tests compare them with
+// byte-at-a-time references (tests/reference/byte_search_reference.h).
 #include "search/byte_search.h"
 
 #include <array>
@@ -97,40 +97,4 @@ std::int64_t find_in_signed_ranges_or_set(bytes_view target, std::span<const byt
   return scan(target, members, fits ? vector_skip(target, m) : 0);
 }
 
-namespace detail {
-
-std::int64_t find_first_of_scalar(bytes_view target, bytes_view set) {
-  for (std::size_t i = 0; i < target.size(); ++i) {
-    for (std::uint8_t b : set) {
-      if (target[i] == b) return static_cast<std::int64_t>(i) + 1;
-    }
-  }
-  return 0;
-}
-
-std::int64_t find_in_ranges_scalar(bytes_view target, std::span<const byte_range> ranges) {
-  for (std::size_t i = 0; i < target.size(); ++i) {
-    for (const byte_range& r : ranges) {
-      if (in_range(target[i], r)) return static_cast<std::int64_t>(i) + 1;
-    }
-  }
-  return 0;
-}
-
-std::int64_t find_in_signed_ranges_or_set_scalar(bytes_view target,
-                                                 std::span<const byte_range> ranges,
-                                                 bytes_view set) {
-  for (std::size_t i = 0; i < target.size(); ++i) {
-    const std::int64_t value = static_cast<std::int8_t>(target[i]);
-    for (const byte_range& r : ranges) {
-      if (in_range(value, r)) return static_cast<std::int64_t>(i) + 1;
-    }
-    for (std::uint8_t b : set) {
-      if (target[i] == b) return static_cast<std::int64_t>(i) + 1;
-    }
-  }
-  return 0;
-}
-
-}  // namespace detail
 }  // namespace zul::search

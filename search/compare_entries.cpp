@@ -16,10 +16,6 @@
 
 namespace {
 
-zul::search::bytes_view bytes_of(std::string_view text) {
-  return {reinterpret_cast<const std::uint8_t*>(text.data()), text.size()};
-}
-
 // Raises "OutOfMemoryException" for a work buffer of bytes bytes; the count
 // is printed as a 32-bit signed integer (a larger count shows truncated).
 void raise_allocation_failure(std::int64_t bytes) {
@@ -73,7 +69,7 @@ int64_t StrCompCharsZUL(REALstring a, REALstring b) noexcept {
     }
     rbText ta(a);
     rbText tb(b);
-    return zul::search::compare_bytes(bytes_of(ta.utf8()), bytes_of(tb.utf8()));
+    return zul::search::compare_bytes(zul::bytes_of(ta.utf8()), zul::bytes_of(tb.utf8()));
   });
 }
 

@@ -79,16 +79,4 @@ std::string replace_non_printable(std::span<const std::uint8_t> bytes, std::uint
   return out;
 }
 
-namespace detail {
-
-bool all_bytes_in_scalar(std::span<const std::uint8_t> bytes, byte_class cls) noexcept {
-  if (bytes.empty()) return false;
-  for (const std::uint8_t c : bytes) {
-    if (!byte_in(c, cls)) return false;
-  }
-  return true;
-}
-
-}  // namespace detail
-
 }  // namespace zul::text

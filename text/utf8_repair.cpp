@@ -3,7 +3,8 @@
 // byte rules walk on to the faulty byte, which alone takes the placeholder,
 // and the block kernel resumes after it. On data dense with faults (a kernel
 // call that gets nothing) the byte rules carry on alone for a stretch, so
-// random bytes do not pay a block check per fault.
+// random bytes do not pay a block check per fault. Tests compare it with a
+// per-position reference (tests/reference/utf8_repair_reference.h).
 #include "text/utf8_repair.h"
 
 #include <cstring>
@@ -17,19 +18,6 @@ constexpr std::size_t kScalarStretch = 256;  // scalar-only bytes after a short 
 bool in(std::uint8_t c, std::uint8_t low, std::uint8_t high) { return c >= low && c <= high; }
 
 }  // namespace
-
-std::size_t well_formed_length(bytes_view b) noexcept {
-  if (b.empty()) return 0;
-  const std::uint8_t c = b[0];
-  if (c <= 0x7F) return 1;
-  const utf8_lead row = kUtf8Lead[c];
-  if (row.length == 0 || b.size() < row.length) return 0;
-  if (!in(b[1], row.second_low, row.second_high)) return 0;
-  for (std::size_t k = 2; k < row.length; ++k) {
-    if (!in(b[k], 0x80, 0xBF)) return 0;
-  }
-  return row.length;
-}
 
 std::size_t well_formed_prefix(bytes_view bytes) noexcept {
   return utf8_scan(bytes.data(), 0, bytes.size(), bytes.size());
@@ -71,7 +59,7 @@ out_buffer repair_utf8(bytes_view bytes, std::string_view placeholder,
         ++i;
         continue;
       }
-      const utf8_lead row = kUtf8Lead[c];
+      const utf8_lead row = kUtf8Leads[c];
       if (row.length != 0 && n - i >= row.length && in(p[i + 1], row.second_low, row.second_high) &&
           (row.length < 3 || (p[i + 2] & 0xC0) == 0x80) &&
           (row.length < 4 || (p[i + 3] & 0xC0) == 0x80)) {

@@ -18,11 +18,6 @@ namespace zul::text {
 
 using bytes_view = std::span<const std::uint8_t>;
 
-// Length (1 to 4) of the well-formed sequence that bytes begins with, or 0
-// when its first byte begins none (also when the end cuts the sequence short
-// or bytes is empty).
-std::size_t well_formed_length(bytes_view bytes) noexcept;
-
 // Length of the longest prefix of bytes made of whole well-formed sequences:
 // the offset of the first byte that begins no well-formed sequence, or
 // bytes.size() when there is none.
