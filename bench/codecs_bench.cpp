@@ -15,6 +15,8 @@
 
 #include "common/bytes.h"
 #include "common/cpu.h"
+#include "common/scan.h"
+#include "encodings/url.h"
 #include "text/latin1.h"
 #include "text/utf8_repair.h"
 
@@ -177,6 +179,51 @@ void BM_encode_iso8859(benchmark::State& state, charset_input kind, zul::simd::i
   state.SetBytesProcessed(static_cast<std::int64_t>(state.iterations()) * state.range(0));
 }
 
+// Inputs for the byte codecs: letters and digits that need no change, the
+// same with one of the codec's special bytes every 96 bytes, and nothing
+// but special bytes.
+enum codec_input { kNoChange, kOneIn96, kAllSpecial };
+
+std::string codec_input_of(codec_input kind, std::size_t size, std::string_view specials) {
+  std::string s = repeat_pieces(size, {"Plain", "text", "made", "of", "Words", "0123", "and"}, 4);
+  std::size_t k = 0;
+  if (kind == kOneIn96) {
+    for (std::size_t i = 95; i < size; i += 96) s[i] = specials[k++ % specials.size()];
+  } else if (kind == kAllSpecial) {
+    for (char& c : s) c = specials[k++ % specials.size()];
+  }
+  return s;
+}
+
+using byte_codec = zul::out_buffer (*)(std::string_view, const zul::scan_kernels&);
+
+void BM_codec(benchmark::State& state, byte_codec codec, codec_input kind, std::string specials,
+              zul::simd::isa level) {
+  const std::string in = codec_input_of(kind, static_cast<std::size_t>(state.range(0)), specials);
+  const zul::scan_kernels& scan = zul::scan_for(level);
+  for (auto _ : state) benchmark::DoNotOptimize(codec(in, scan));
+  state.SetBytesProcessed(static_cast<std::int64_t>(state.iterations()) * state.range(0));
+}
+
+// Each codec with the bytes that make it work; "scalar" is the plain scan.
+struct codec_row {
+  const char* name;
+  byte_codec codec;
+  const char* specials;
+};
+const codec_row kCodecs[] = {
+    {"encode_url",
+     [](std::string_view in, const zul::scan_kernels& k) {
+       return zul::encodings::encode_url(in, 1, k);
+     },
+     " &/="},
+    {"decode_url",
+     [](std::string_view in, const zul::scan_kernels& k) {
+       return zul::encodings::decode_url(in, 1, k);
+     },
+     "+"},
+};
+
 const bool registered = [] {
   const std::pair<utf8_input, const char*> inputs[] = {{kAscii, "ascii"},
                                                        {kMixed, "mixed"},
@@ -208,6 +255,19 @@ const bool registered = [] {
     benchmark::RegisterBenchmark(("BM_decode_iso8859/typical/" + isa).c_str(), BM_decode_iso8859,
                                  level)
         ->Apply(sizes);
+  }
+  const std::pair<codec_input, const char*> codec_inputs[] = {
+      {kNoChange, "plain"}, {kOneIn96, "typical"}, {kAllSpecial, "worst"}};
+  for (const codec_row& row : kCodecs) {
+    for (const auto& [kind, name] : codec_inputs) {
+      for (const zul::simd::isa level : zul::simd::supported_isas()) {
+        const std::string label =
+            std::string("BM_") + row.name + "/" + name + "/" + zul::simd::isa_name(level);
+        benchmark::RegisterBenchmark(label.c_str(), BM_codec, row.codec, kind,
+                                     std::string(row.specials), level)
+            ->Apply(sizes);
+      }
+    }
   }
   return true;
 }();

@@ -38,6 +38,9 @@ class out_buffer {
   std::size_t capacity() const noexcept { return capacity_; }
   const std::uint8_t* data() const noexcept { return data_; }
   std::string_view view() const noexcept { return {reinterpret_cast<const char*>(data_), size_}; }
+  // The result, for builders and comparisons that take a string view.
+  operator std::string_view() const noexcept { return view(); }  // NOLINT: implicit on purpose
+  friend bool operator==(const out_buffer& a, std::string_view b) noexcept { return a.view() == b; }
 
   // Makes room for extra more bytes. Throws std::bad_alloc when the result
   // would pass the limit or memory runs out.

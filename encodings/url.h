@@ -9,6 +9,9 @@
 #include <string>
 #include <string_view>
 
+#include "common/out_buffer.h"
+#include "common/scan.h"
+
 namespace zul::encodings {
 
 // Options bits (only options & 3 count):
@@ -16,13 +19,17 @@ namespace zul::encodings {
 //   2: space -> "%20", "+" -> "%2B";  3: as 0.
 // The decoder turns "+" into a space when bit 0 is set.
 
-// Percent-encodes every byte of in. Output is at most 3 * size bytes.
-std::string encode_url(std::string_view in, std::int64_t options);
+// Percent-encodes every byte of in. Output is at most 3 * size bytes; throws
+// std::bad_alloc when it cannot be had or would pass 0x7FFFFFFF bytes. scan
+// is the byte-set search to use (tests pass every level's).
+out_buffer encode_url(std::string_view in, std::int64_t options,
+                      const scan_kernels& scan = machine_scan());
 
 // Decodes "%hh" sequences. Never rejects input: a non-hex digit counts as 0,
 // the two bytes after "%" are always consumed, and a "%" within the last two
 // bytes reads missing digits as 0 (nothing past the end is read). Output is
 // at most in.size() bytes.
-std::string decode_url(std::string_view in, std::int64_t options);
+out_buffer decode_url(std::string_view in, std::int64_t options,
+                      const scan_kernels& scan = machine_scan());
 
 }  // namespace zul::encodings
