@@ -16,6 +16,7 @@
 #include "common/bytes.h"
 #include "common/cpu.h"
 #include "common/scan.h"
+#include "encodings/html_tags.h"
 #include "encodings/url.h"
 #include "text/latin1.h"
 #include "text/utf8_repair.h"
@@ -222,6 +223,11 @@ const codec_row kCodecs[] = {
        return zul::encodings::decode_url(in, 1, k);
      },
      "+"},
+    {"remove_html_tags",
+     [](std::string_view in, const zul::scan_kernels& k) {
+       return zul::encodings::remove_html_tags(in, "", k);
+     },
+     "<>"},
 };
 
 const bool registered = [] {

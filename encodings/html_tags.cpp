@@ -1,36 +1,61 @@
 // Tag removal: one pass over the bytes; output reserved once for the input
 // size + 10 and grown only when a replacement text is longer than the tags
-// it stands for. Runs outside tags are copied whole.
+// it stands for. A byte-set search finds the next bracket or zero byte; the
+// run before it is copied whole outside tags, and skipped whole inside tags
+// when the replacement is empty. The bytes after it, and bytes inside tags
+// with a replacement to write, go one by one.
 #include "encodings/html_tags.h"
 
 #include <cstdint>
 
 namespace zul::encodings {
+namespace {
 
-std::string remove_html_tags(std::string_view utf8, std::string_view replacement) {
-  std::string out;
-  out.reserve(utf8.size() + 10);
-  std::int64_t depth = 0;
+constexpr simd::byte_set kBrackets =
+    byte_set_where([](std::uint8_t b) { return b == '<' || b == '>' || b == '\0'; });
+
+// Bytes taken one by one after each search: a few, doubling while searches
+// keep finding short runs (markup dense with brackets), back to a few after
+// a long run.
+constexpr std::size_t kAfterMin = 4, kAfterMax = 512, kShortRun = 16;
+
+}  // namespace
+
+out_buffer remove_html_tags(std::string_view utf8, std::string_view replacement,
+                            const scan_kernels& scan) {
+  const auto* p = reinterpret_cast<const std::uint8_t*>(utf8.data());
   const std::size_t n = utf8.size();
+  out_buffer out(n < kResultLimit - 10 ? n + 10 : kResultLimit);
+  const std::size_t per_byte = replacement.size() > 1 ? replacement.size() : 1;
+  std::int64_t depth = 0;
+  std::size_t after = kAfterMin;
   std::size_t i = 0;
   while (i < n) {
-    if (depth == 0) {
-      std::size_t run = i;
-      while (run < n && utf8[run] != '<' && utf8[run] != '>' && utf8[run] != '\0') ++run;
-      out.append(utf8.data() + i, run - i);
-      i = run;
-      if (i == n) break;
+    if (depth == 0 || replacement.empty()) {
+      // Outside tags the run is copied, inside (with nothing to write) skipped.
+      const std::size_t run = scan.find_first(kBrackets, p + i, n - i);
+      if (depth == 0) {
+        out.ensure(run);
+        out.put(p + i, run);
+      }
+      i += run;
+      after = run < kShortRun ? (after < kAfterMax ? 2 * after : after) : kAfterMin;
     }
-    const char c = utf8[i++];
-    if (c == '\0') continue;
-    if (c == '<') {
-      ++depth;
-    } else if (c == '>') {
-      --depth;
-    } else if (depth != 0) {
-      out += replacement;
-    } else {
-      out += c;
+    const std::size_t stop = n - i > after ? i + after : n;
+    out.ensure((stop - i) * per_byte);
+    for (; i < stop; ++i) {
+      const std::uint8_t c = p[i];
+      if (c == '<') {
+        ++depth;
+      } else if (c == '>') {
+        --depth;
+      } else if (c == '\0') {
+        continue;
+      } else if (depth == 0) {
+        out.put_byte(c);
+      } else {
+        out.put(replacement);
+      }
     }
   }
   return out;

@@ -7,11 +7,17 @@
 #include <string>
 #include <string_view>
 
+#include "common/out_buffer.h"
+#include "common/scan.h"
+
 namespace zul::encodings {
 
 // Drops zero bytes and the brackets themselves; writes other bytes when the
 // depth is exactly 0, and replacement (possibly empty) for each other byte,
 // so replacement appears once per byte inside a tag.
-std::string remove_html_tags(std::string_view utf8, std::string_view replacement);
+// Throws std::bad_alloc when the output cannot be had or would pass
+// 0x7FFFFFFF bytes. scan is the byte-set search to use.
+out_buffer remove_html_tags(std::string_view utf8, std::string_view replacement,
+                            const scan_kernels& scan = machine_scan());
 
 }  // namespace zul::encodings

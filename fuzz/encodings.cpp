@@ -3,7 +3,8 @@
 // Invariants:
 //  1. no crash, no read outside the input (run under the sanitizers);
 //  2. every decoder accepts every byte sequence;
-//  3. fast paths equal their scalar references (URL, HTML, yEnc), at every
+//  3. fast paths equal their scalar references (URL, HTML, yEnc, tag
+//     removal), at every
 //     kernel level the machine has;
 //  4. decode(encode(x)) == x for URL with options 0 to 2, and for
 //     quoted-printable text without line breaks (those become CR LF / LF).
@@ -14,12 +15,14 @@
 #include <vector>
 
 #include "encodings/html.h"
+#include "encodings/html_tags.h"
 #include "encodings/quoted_printable.h"
 #include "encodings/sql.h"
 #include "encodings/url.h"
 #include "encodings/yenc.h"
 #include "fuzz/fuzz_check.h"
 #include "tests/reference/html_reference.h"
+#include "tests/reference/html_tags_reference.h"
 #include "tests/reference/url_reference.h"
 #include "tests/reference/yenc_reference.h"
 
@@ -65,6 +68,11 @@ extern "C" int LLVMFuzzerTestOneInput(const std::uint8_t* data, std::size_t size
     }
     default:
       (void)enc::decode_mysql(in);
+      for (const zul::simd::isa level : zul::simd::supported_isas()) {
+        const std::string_view with = options & 1 ? "?" : "";
+        check(enc::remove_html_tags(in, with, zul::scan_for(level)) ==
+              zul::reference::remove_html_tags_reference(in, with));
+      }
       (void)enc::replace_sql_booleans(in);
       break;
   }
