@@ -91,7 +91,8 @@ void BM_repair_utf8(benchmark::State& state, utf8_input kind, zul::simd::isa lev
   const std::string& in = utf8_input_of(kind, static_cast<std::size_t>(state.range(0)));
   const auto& kernels = zul::simd::kernels_for(zul::simd::utf8_tables(), level);
   for (auto _ : state) {
-    benchmark::DoNotOptimize(zul::text::repair_utf8(zul::bytes_of(in), "?", kernels));
+    benchmark::DoNotOptimize(
+        zul::text::repair_utf8(zul::bytes_of(in), "?", zul::kMaxResultBytes, kernels));
   }
   state.SetBytesProcessed(static_cast<std::int64_t>(state.iterations()) * state.range(0));
 }
@@ -215,7 +216,7 @@ struct codec_row {
 const codec_row kCodecs[] = {
     {"encode_url",
      [](std::string_view in, const zul::scan_kernels& k) {
-       return zul::encodings::encode_url(in, 1, k);
+       return zul::encodings::encode_url(in, 1, zul::kMaxResultBytes, k);
      },
      " &/="},
     {"decode_url",
@@ -225,7 +226,7 @@ const codec_row kCodecs[] = {
      "+"},
     {"remove_html_tags",
      [](std::string_view in, const zul::scan_kernels& k) {
-       return zul::encodings::remove_html_tags(in, "", k);
+       return zul::encodings::remove_html_tags(in, "", zul::kMaxResultBytes, k);
      },
      "<>"},
 };

@@ -78,10 +78,16 @@ void BM_decode_html(benchmark::State& state) {
 
 void sizes(benchmark::internal::Benchmark* b) { b->Arg(1 << 10)->Arg(1 << 20); }
 
+// The HTML encoder at the host's result limit, as a plain two-argument
+// function.
+std::string encode_html_at_limit(enc::code_point_view text, std::int64_t options) {
+  return enc::encode_html(text, options);
+}
+
 BENCHMARK(BM_encode_url)->Apply(sizes);
 BENCHMARK(BM_encode_url_reference)->Apply(sizes);
 BENCHMARK(BM_decode_url)->Apply(sizes);
-BENCHMARK(BM_html<enc::encode_html>)->Name("BM_encode_html")->Apply(sizes);
+BENCHMARK(BM_html<encode_html_at_limit>)->Name("BM_encode_html")->Apply(sizes);
 BENCHMARK(BM_html<zul::reference::encode_html_reference>)
     ->Name("BM_encode_html_reference")
     ->Apply(sizes);

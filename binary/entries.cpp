@@ -17,6 +17,7 @@
 #include "binary/hex.h"
 #include "binary/hex_dump.h"
 #include "binary/readable_runs.h"
+#include "common/size_gate.h"
 #include "plugin/exceptions.h"
 #include "plugin/host_services.h"
 #include "plugin/natives.h"
@@ -29,10 +30,6 @@ namespace {
 using text_encoding::kASCII;
 using text_encoding::kUnknown;
 using text_encoding::kUTF8;
-
-// The longest string the host accepts from the result builder; longer
-// results would come back empty, so they are not computed at all.
-constexpr std::int64_t kMaxResult = 0x7FFFFFFF;
 
 REALstring build_bytes(std::string_view bytes) { return build_string(bytes, kUnknown); }
 
@@ -61,6 +58,7 @@ REALstring StringAND(REALstring a, REALstring b) noexcept {
   if (!a || !b) return nullptr;
   return quietly<REALstring>(nullptr, [&] {
     const rbData data(a), mask(b);
+    if (!zul::fits_result(data.bytes().size())) return REALstring{};
     return build_bytes(zul::binary::and_with_mask(data.bytes(), mask.bytes()));
   });
 }
@@ -69,6 +67,7 @@ REALstring StringOR(REALstring a, REALstring b) noexcept {
   if (!a || !b) return nullptr;
   return quietly<REALstring>(nullptr, [&] {
     const rbData data(a), mask(b);
+    if (!zul::fits_result(data.bytes().size())) return REALstring{};
     return build_bytes(zul::binary::or_with_mask(data.bytes(), mask.bytes()));
   });
 }
@@ -77,6 +76,7 @@ REALstring StringXOR(REALstring data, REALstring mask, int64_t mask_offset) noex
   if (!data || !mask) return nullptr;
   return quietly<REALstring>(nullptr, [&] {
     const rbData d(data), m(mask);
+    if (!zul::fits_result(d.bytes().size())) return REALstring{};
     return build_bytes(zul::binary::xor_with_mask(d.bytes(), m.bytes(), mask_offset));
   });
 }
@@ -85,6 +85,7 @@ REALstring StringXOR2(REALstring data, REALstring mask, int64_t mask_offset) noe
   if (!data || !mask) return nullptr;
   return quietly<REALstring>(nullptr, [&] {
     const rbData d(data), m(mask);
+    if (!zul::fits_result(d.bytes().size())) return REALstring{};
     return build_bytes(zul::binary::xor_with_mask_and_position(d.bytes(), m.bytes(), mask_offset));
   });
 }
@@ -117,7 +118,7 @@ REALstring CreateStringZUL(int64_t length, REALstring content) noexcept {
     // does not fit in 64 bits cannot be allocated.
     const std::int64_t unit = c.length == 0 ? 1 : c.length;
     if (length > std::numeric_limits<std::int64_t>::max() - unit - 4) throw std::bad_alloc();
-    if (length > kMaxResult) return nullptr;
+    if (!zul::fits_result(static_cast<std::uint64_t>(length))) return nullptr;
     const std::string bytes =
         zul::binary::repeat_to_length(c.bytes(), static_cast<std::size_t>(length));
     // A null content has no encoding to ask the host about; its zero bytes
@@ -127,7 +128,7 @@ REALstring CreateStringZUL(int64_t length, REALstring content) noexcept {
 }
 
 REALstring RandomBytesStringZUL(int64_t length, signed char ascii) noexcept {
-  if (length < 1 || length > kMaxResult) return nullptr;
+  if (length < 1 || !zul::fits_result(static_cast<std::uint64_t>(length))) return nullptr;
   return quietly<REALstring>(nullptr, [&] {
     const bool as_ascii = ascii != 0;
     const std::string bytes = zul::binary::random_bytes(static_cast<std::size_t>(length), as_ascii);
@@ -139,7 +140,7 @@ REALstring EncodingToHex(REALstring s) noexcept {
   if (!s) return nullptr;
   return quietly<REALstring>(nullptr, [&]() -> REALstring {
     const rbData in(s);
-    if (in.length < 1 || in.length > kMaxResult / 2) return nullptr;
+    if (in.length < 1 || !zul::result_size().add_times(2, in.bytes().size()).fits()) return nullptr;
     return build_string(zul::binary::encode_hex(in.bytes()), kASCII);
   });
 }

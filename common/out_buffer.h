@@ -1,8 +1,14 @@
 // A growable output buffer for workers whose result size is known only
 // roughly in advance: reserved once from the input, never zero-filled, grown
-// geometrically (rarely) when the estimate is short, and never beyond the
-// 0x7FFFFFFF bytes a host string can hold. Vector kernels write straight
-// into the room past size() and then commit what they wrote.
+// geometrically (rarely) when the estimate is short. Vector kernels write
+// straight into the room past size() and then commit what they wrote.
+//
+// The result limit (0x7FFFFFFF bytes unless a smaller one is given): room is
+// never granted past limit + kSlack, and every request for room is either
+// exact or at most kSlack bytes, so a refused request means the result has
+// passed the limit; fits() tells the same at the end. The writer then gives
+// its empty result. The slack lets kernels write whole blocks and fixed-size
+// stores near the end; the host never sees more than limit bytes.
 #pragma once
 
 #include <cstddef>
@@ -12,20 +18,27 @@
 #include <new>
 #include <string_view>
 
-namespace zul {
+#include "common/size_gate.h"
 
-// Largest result a host string can hold.
-inline constexpr std::size_t kResultLimit = 0x7FFFFFFF;
+namespace zul {
 
 class out_buffer {
  public:
-  // Reserves min(reserve, limit) bytes. Throws std::bad_alloc when the
-  // memory cannot be had.
-  explicit out_buffer(std::size_t reserve, std::size_t limit = kResultLimit) : limit_(limit) {
-    grow_to(reserve < limit ? reserve : limit);
+  // Largest request for room that may exceed what will be written.
+  static constexpr std::size_t kSlack = 16384;
+
+  // Reserves min(reserve, limit + kSlack) bytes. Throws std::bad_alloc when
+  // the memory cannot be had.
+  explicit out_buffer(std::size_t reserve, std::uint64_t limit = kMaxResultBytes)
+      : limit_(limit), cap_(limit + kSlack) {
+    grow_to(reserve < cap_ ? reserve : static_cast<std::size_t>(cap_));
   }
   out_buffer(out_buffer&& other) noexcept
-      : data_(other.data_), size_(other.size_), capacity_(other.capacity_), limit_(other.limit_) {
+      : data_(other.data_),
+        size_(other.size_),
+        capacity_(other.capacity_),
+        limit_(other.limit_),
+        cap_(other.cap_) {
     other.data_ = nullptr;
     other.size_ = other.capacity_ = 0;
   }
@@ -35,22 +48,33 @@ class out_buffer {
   ~out_buffer() { std::free(data_); }
 
   std::size_t size() const noexcept { return size_; }
-  std::size_t capacity() const noexcept { return capacity_; }
   const std::uint8_t* data() const noexcept { return data_; }
   std::string_view view() const noexcept { return {reinterpret_cast<const char*>(data_), size_}; }
   // The result, for builders and comparisons that take a string view.
   operator std::string_view() const noexcept { return view(); }  // NOLINT: implicit on purpose
   friend bool operator==(const out_buffer& a, std::string_view b) noexcept { return a.view() == b; }
 
-  // Makes room for extra more bytes. Throws std::bad_alloc when the result
-  // would pass the limit or memory runs out.
-  void ensure(std::size_t extra) {
-    if (extra <= capacity_ - size_) return;
-    if (extra > limit_ - size_) throw std::bad_alloc();
-    const std::size_t want = size_ + extra;
-    const std::size_t half_again = capacity_ + capacity_ / 2;
-    grow_to(want > half_again ? want : (half_again < limit_ ? half_again : limit_));
+  // True while the result is within the limit.
+  bool fits() const noexcept { return size_ <= limit_; }
+  // Forgets the result (the empty result of a writer that passed the limit).
+  out_buffer&& discard() noexcept {
+    size_ = 0;
+    return static_cast<out_buffer&&>(*this);
   }
+
+  // Makes room for extra more bytes (exact, or at most kSlack). False when
+  // that would pass limit + kSlack, that is when the result has passed the
+  // limit. Throws std::bad_alloc when memory runs out.
+  [[nodiscard]] bool ensure(std::size_t extra) {
+    if (extra <= capacity_ - size_) return true;
+    if (extra > cap_ - size_) return false;
+    const std::uint64_t want = std::uint64_t{size_} + extra;
+    const std::uint64_t half_again = capacity_ + capacity_ / 2;
+    const std::uint64_t grown = want > half_again ? want : half_again;
+    grow_to(static_cast<std::size_t>(grown < cap_ ? grown : cap_));
+    return true;
+  }
+  std::size_t room() const noexcept { return capacity_ - size_; }
 
   // The first free byte; at least the room last ensured is writable.
   std::uint8_t* tail() noexcept { return data_ + size_; }
@@ -76,7 +100,8 @@ class out_buffer {
   std::uint8_t* data_ = nullptr;
   std::size_t size_ = 0;
   std::size_t capacity_ = 0;
-  std::size_t limit_;
+  std::uint64_t limit_;
+  std::uint64_t cap_;
 };
 
 }  // namespace zul

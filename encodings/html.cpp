@@ -1,6 +1,7 @@
 // HTML reference encoder and decoder over code points. Both reserve their
 // output once from the input length (4 bytes per character + 4 KiB; one code
-// point per character + 4 Ki) and make one pass. The encoder decides every
+// point per character + 4 Ki), grow it only up to their result limit, and
+// make one pass. The encoder decides every
 // ASCII character from a 128-entry table per mode and looks characters from
 // U+0080 up in the entity index; the decoder copies runs without "&" whole.
 // Row-by-row references live with the tests (tests/reference/).
@@ -11,23 +12,33 @@
 #include <string_view>
 
 #include "common/markup.h"
+#include "common/size_gate.h"
 #include "encodings/html_entities.h"
 
 namespace zul::encodings {
 namespace {
 
-void append_numeric_reference(std::string& out, std::uint32_t cp) {
-  char digits[10];
-  const auto end = std::to_chars(digits, digits + sizeof digits, cp).ptr;
-  out += "&#";
-  out.append(digits, end);
-  out += ';';
+// Each append writes nothing and says false when the output would pass
+// limit bytes.
+bool append_text(std::string& out, std::string_view text, std::uint64_t limit) {
+  if (!make_room(out, text.size(), limit)) return false;
+  out += text;
+  return true;
 }
 
-void append_named_reference(std::string& out, std::string_view name) {
+bool append_numeric_reference(std::string& out, std::uint32_t cp, std::uint64_t limit) {
+  char text[16] = {'&', '#'};
+  char* end = std::to_chars(text + 2, text + sizeof text - 1, cp).ptr;
+  *end++ = ';';
+  return append_text(out, {text, static_cast<std::size_t>(end - text)}, limit);
+}
+
+bool append_named_reference(std::string& out, std::string_view name, std::uint64_t limit) {
+  if (!make_room(out, name.size() + 2, limit)) return false;
   out += '&';
   out += name;
   out += ';';
+  return true;
 }
 
 // What the encoder writes for each ASCII character in one mode; an empty
@@ -98,15 +109,16 @@ std::optional<std::uint32_t> reference_value(code_point_view name) {
 
 }  // namespace
 
-code_points decode_html(code_point_view text) {
+code_points decode_html(code_point_view text, std::uint64_t limit) {
   text = skip_byte_order_mark(text);
   const std::size_t n = text.size();
   code_points out;
-  out.reserve(n + 4096);
+  out.reserve(capped_reserve(std::uint64_t{n} + 4096, limit));
   std::size_t i = 0;
   while (i < n) {
     std::size_t run = i;
     while (run < n && text[run] != '&') ++run;
+    if (!make_room(out, run - i, limit)) return {};
     out.insert(out.end(), text.begin() + static_cast<std::ptrdiff_t>(i),
                text.begin() + static_cast<std::ptrdiff_t>(run));
     i = run;
@@ -125,11 +137,13 @@ code_points decode_html(code_point_view text) {
     }
     if (bounded && length > 0) {
       if (auto cp = reference_value(text.subspan(i + 1, length))) {
+        if (!make_room(out, 1, limit)) return {};
         out.push_back(*cp);
         i += length + 2;
         continue;
       }
     }
+    if (!make_room(out, 1, limit)) return {};
     out.push_back('&');
     ++i;
   }
@@ -143,20 +157,22 @@ bool html_needs_escaping(code_point_view text) {
   return false;
 }
 
-std::string encode_html(code_point_view text, std::int64_t options) {
+std::string encode_html(code_point_view text, std::int64_t options, std::uint64_t limit) {
   text = skip_byte_order_mark(text);
   const bool keep_markup = (options & 1) != 0;
   const ascii_actions& actions = keep_markup ? kKeepMarkup : kEscapeMarkup;
   std::string out;
-  out.reserve(4 * text.size() + 4096);
+  out.reserve(capped_reserve(4 * std::uint64_t{text.size()} + 4096, limit));
   for (const std::uint32_t c : text) {
+    bool fits;
     if (c < 128) {
-      out += actions[c];
+      fits = append_text(out, actions[c], limit);
     } else if (const std::string_view name = entity_name(c, true); !name.empty()) {
-      append_named_reference(out, name);
+      fits = append_named_reference(out, name, limit);
     } else {
-      append_numeric_reference(out, c);
+      fits = append_numeric_reference(out, c, limit);
     }
+    if (!fits) return {};
   }
   return out;
 }

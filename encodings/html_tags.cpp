@@ -22,11 +22,10 @@ constexpr std::size_t kAfterMin = 4, kAfterMax = 512, kShortRun = 16;
 }  // namespace
 
 out_buffer remove_html_tags(std::string_view utf8, std::string_view replacement,
-                            const scan_kernels& scan) {
+                            std::uint64_t limit, const scan_kernels& scan) {
   const auto* p = reinterpret_cast<const std::uint8_t*>(utf8.data());
   const std::size_t n = utf8.size();
-  out_buffer out(n < kResultLimit - 10 ? n + 10 : kResultLimit);
-  const std::size_t per_byte = replacement.size() > 1 ? replacement.size() : 1;
+  out_buffer out(n + 10, limit);
   std::int64_t depth = 0;
   std::size_t after = kAfterMin;
   std::size_t i = 0;
@@ -35,14 +34,14 @@ out_buffer remove_html_tags(std::string_view utf8, std::string_view replacement,
       // Outside tags the run is copied, inside (with nothing to write) skipped.
       const std::size_t run = scan.find_first(kBrackets, p + i, n - i);
       if (depth == 0) {
-        out.ensure(run);
+        if (!out.ensure(run)) return out.discard();
         out.put(p + i, run);
       }
       i += run;
       after = run < kShortRun ? (after < kAfterMax ? 2 * after : after) : kAfterMin;
     }
     const std::size_t stop = n - i > after ? i + after : n;
-    out.ensure((stop - i) * per_byte);
+    if (!out.ensure(stop - i)) return out.discard();  // room for the bytes kept
     for (; i < stop; ++i) {
       const std::uint8_t c = p[i];
       if (c == '<') {
@@ -54,10 +53,12 @@ out_buffer remove_html_tags(std::string_view utf8, std::string_view replacement,
       } else if (depth == 0) {
         out.put_byte(c);
       } else {
+        if (!out.ensure(replacement.size() + (stop - i))) return out.discard();
         out.put(replacement);
       }
     }
   }
+  if (!out.fits()) return out.discard();
   return out;
 }
 

@@ -15,9 +15,11 @@ namespace zul::encodings {
 // Drops zero bytes and the brackets themselves; writes other bytes when the
 // depth is exactly 0, and replacement (possibly empty) for each other byte,
 // so replacement appears once per byte inside a tag.
-// Throws std::bad_alloc when the output cannot be had or would pass
-// 0x7FFFFFFF bytes. scan is the byte-set search to use.
+// Output that would pass limit bytes gives "" (the removal stops there).
+// Throws std::bad_alloc when memory runs out. scan is the byte-set search to
+// use.
 out_buffer remove_html_tags(std::string_view utf8, std::string_view replacement,
+                            std::uint64_t limit = kMaxResultBytes,
                             const scan_kernels& scan = machine_scan());
 
 }  // namespace zul::encodings

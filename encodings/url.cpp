@@ -73,18 +73,20 @@ constexpr std::size_t kAfterMin = 8, kAfterMax = 512, kShortRun = 16;
 
 }  // namespace
 
-out_buffer encode_url(std::string_view in, std::int64_t options, const scan_kernels& scan) {
+out_buffer encode_url(std::string_view in, std::int64_t options, std::uint64_t limit,
+                      const scan_kernels& scan) {
   const escape_table& table = table_for(options);
   const auto* p = reinterpret_cast<const std::uint8_t*>(in.data());
   const std::size_t n = in.size();
-  out_buffer out(n < kResultLimit / 3 ? 3 * n + 10 : kResultLimit);
+  if (!fits_result(n, limit)) return out_buffer(0);  // every byte gives at least one
+  out_buffer out(result_size().add_times(3, n).add(10).fits() ? 3 * n + 10 : limit, limit);
   std::size_t i = 0;
   std::size_t after = kAfterMin;
   while (i < n) {
     const std::size_t run = scan.find_first(kNeedsWork, p + i, n - i);
     after = run < kShortRun ? (after < kAfterMax ? 2 * after : after) : kAfterMin;
     // The run, then up to `after` entries of 3 bytes stored as 4.
-    out.ensure(run + 3 * after + 1);
+    if (!out.ensure(run + 3 * after + 1)) return out.discard();
     out.put(p + i, run);
     i += run;
     if (i == n) break;
@@ -98,6 +100,7 @@ out_buffer encode_url(std::string_view in, std::int64_t options, const scan_kern
     }
     out.commit(static_cast<std::size_t>(o - first));
   }
+  if (!out.fits()) return out.discard();
   return out;
 }
 

@@ -19,10 +19,12 @@ namespace zul::encodings {
 //   2: space -> "%20", "+" -> "%2B";  3: as 0.
 // The decoder turns "+" into a space when bit 0 is set.
 
-// Percent-encodes every byte of in. Output is at most 3 * size bytes; throws
-// std::bad_alloc when it cannot be had or would pass 0x7FFFFFFF bytes. scan
-// is the byte-set search to use (tests pass every level's).
+// Percent-encodes every byte of in. Output is at most 3 * size bytes; an
+// output longer than limit bytes gives "" (room for it is reserved, never
+// touched). Throws std::bad_alloc when memory runs out. scan is the byte-set
+// search to use (tests pass every level's).
 out_buffer encode_url(std::string_view in, std::int64_t options,
+                      std::uint64_t limit = kMaxResultBytes,
                       const scan_kernels& scan = machine_scan());
 
 // Decodes "%hh" sequences. Never rejects input: a non-hex digit counts as 0,

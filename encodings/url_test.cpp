@@ -123,7 +123,7 @@ TEST(encode_url, every_scan_level_with_a_special_byte_everywhere) {
     SCOPED_TRACE(simd::isa_name(level));
     testing_sweep::special_byte_sweep(specials, 2 * 64 + 3, [&](const std::string& in) {
       for (std::int64_t options = 0; options < 4; ++options) {
-        ASSERT_EQ(encode_url(in, options, scan_for(level)),
+        ASSERT_EQ(encode_url(in, options, kMaxResultBytes, scan_for(level)),
                   reference::encode_url_reference(in, options))
             << options;
         ASSERT_EQ(decode_url(in, options, scan_for(level)),
@@ -132,7 +132,7 @@ TEST(encode_url, every_scan_level_with_a_special_byte_everywhere) {
       }
     });
     const std::string all = testing_sweep::every_byte_value();
-    const std::string encoded(encode_url(all, 1, scan_for(level)).view());
+    const std::string encoded(encode_url(all, 1, kMaxResultBytes, scan_for(level)).view());
     EXPECT_EQ(encoded, reference::encode_url_reference(all, 1));
     EXPECT_EQ(decode_url(encoded, 1, scan_for(level)), all);
   }

@@ -1,17 +1,23 @@
 // XML escaping: one pass, output reserved once (one code point per input
-// character + 4 Ki); the five markup characters are the only ones XML 1.0
-// text needs escaped. The readiness test is one byte-set search (vector
-// kernels) for the first byte that is not allowed.
+// character + 4 Ki, grown only up to the result limit); the five markup
+// characters are the only ones XML 1.0 text needs escaped. The readiness
+// test is one byte-set search (vector kernels) for the first byte that is
+// not allowed.
 #include "encodings/xml.h"
 
 #include "common/byte_set.h"
 #include "common/markup.h"
+#include "common/size_gate.h"
 
 namespace zul::encodings {
 namespace {
 
-void append(code_points& out, std::string_view ascii) {
+// Appends the reference's characters; false, writing nothing, when the
+// output would pass limit code points.
+bool append(code_points& out, std::string_view ascii, std::uint64_t limit) {
+  if (!make_room(out, ascii.size(), limit)) return false;
   out.insert(out.end(), ascii.begin(), ascii.end());
+  return true;
 }
 
 // Bytes a ready string may not hold: 0, 128 and above, the five markup
@@ -33,31 +39,36 @@ bool xml_needs_escaping(code_point_view text) {
   return false;
 }
 
-code_points encode_xml(code_point_view text, std::int64_t options) {
+code_points encode_xml(code_point_view text, std::int64_t options, std::uint64_t limit) {
   text = skip_byte_order_mark(text);
   const bool named_apostrophe = (options & 1) != 0;
   code_points out;
-  out.reserve(text.size() + 4096);
+  out.reserve(capped_reserve(std::uint64_t{text.size()} + 4096, limit));
   for (const std::uint32_t c : text) {
+    bool fits = true;
     switch (c) {
       case '"':
-        append(out, "&quot;");
+        fits = append(out, "&quot;", limit);
         break;
       case '&':
-        append(out, "&amp;");
+        fits = append(out, "&amp;", limit);
         break;
       case '\'':
-        append(out, named_apostrophe ? "&apos;" : "&#39;");
+        fits = append(out, named_apostrophe ? "&apos;" : "&#39;", limit);
         break;
       case '<':
-        append(out, "&lt;");
+        fits = append(out, "&lt;", limit);
         break;
       case '>':
-        append(out, "&gt;");
+        fits = append(out, "&gt;", limit);
         break;
       default:
-        if (!is_dropped_control(c)) out.push_back(c);
+        if (!is_dropped_control(c)) {
+          fits = make_room(out, 1, limit);
+          if (fits) out.push_back(c);
+        }
     }
+    if (!fits) return {};
   }
   return out;
 }

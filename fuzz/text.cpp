@@ -47,7 +47,8 @@ void check_repair(std::span<const std::uint8_t> data, std::uint8_t knob) {
   const std::string_view placeholder = kPlaceholders[knob % 4];
   const std::string repaired = zul::reference::repair_utf8_reference(data, placeholder);
   for (const zul::simd::isa level : zul::simd::supported_isas()) {
-    check(repair_utf8(data, placeholder, zul::simd::kernels_for(zul::simd::utf8_tables(), level))
+    check(repair_utf8(data, placeholder, zul::kMaxResultBytes,
+                      zul::simd::kernels_for(zul::simd::utf8_tables(), level))
               .view() == repaired);
   }
   if (knob % 4 != 3) check(well_formed_prefix(bytes_of(repaired)) == repaired.size());

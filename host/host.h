@@ -14,6 +14,7 @@
 
 #include <cstdint>
 #include <initializer_list>
+#include <map>
 #include <optional>
 #include <set>
 #include <span>
@@ -35,6 +36,11 @@ struct HostConfig {
   std::set<std::string, std::less<>> null_first;       // null on the first look-up, found later
   std::set<std::string, std::less<>> unknown_classes;  // "PluginNewInstance" answers null
   std::int64_t block_cap = std::int64_t{256} << 20;    // bigger memory blocks cannot be made
+  // LenB answers the mapped length for a string whose bytes are exactly a
+  // key: a string that claims gigabytes while holding a few bytes, for tests
+  // of size limits that must refuse before reading (a read past the real
+  // bytes is what the sanitizers then report).
+  std::map<std::string, std::int64_t, std::less<>> claimed_lengths;
 };
 
 struct RegisteredMethod {

@@ -1,8 +1,8 @@
 // Byte search. The fast versions turn the set and the ranges into one
 // prepared byte set (two 16-byte nibble tables, on the stack) and run the
 // machine's byte-set kernel, whose work per block does not depend on the
-// size of the set; a set of one byte goes to memchr. Tests compare them with
-// byte-at-a-time references (tests/reference/byte_search_reference.h).
+// size of the set; a set of one byte goes to memchr. Tests compare them
+// with byte-at-a-time references (tests/reference/byte_search_reference.h).
 #include "search/byte_search.h"
 
 #include <cstring>

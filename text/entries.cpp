@@ -8,6 +8,7 @@
 #include <string>
 #include <string_view>
 
+#include "common/size_gate.h"
 #include "plugin/exceptions.h"
 #include "plugin/natives.h"
 #include "plugin/rb_data.h"
@@ -57,7 +58,7 @@ REALstring CheckUTF8s(REALstring data, REALstring placeholder) noexcept {
 REALstring ReplaceNonPrintableCharactersZUL(REALstring s, int64_t replace_value) noexcept {
   return quietly<REALstring>(nullptr, [&]() -> REALstring {
     rbData bytes(s);
-    if (bytes.empty()) return nullptr;
+    if (bytes.empty() || !zul::fits_result(bytes.bytes().size())) return nullptr;
     const std::string out = zul::text::replace_non_printable(
         bytes.bytes(), static_cast<std::uint8_t>(replace_value & 0xFF));
     return build_string(out, kASCII);

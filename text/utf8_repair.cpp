@@ -23,23 +23,30 @@ std::size_t well_formed_prefix(bytes_view bytes) noexcept {
   return utf8_scan(bytes.data(), 0, bytes.size(), bytes.size());
 }
 
-out_buffer repair_utf8(bytes_view bytes, std::string_view placeholder,
+out_buffer repair_utf8(bytes_view bytes, std::string_view placeholder, std::uint64_t limit,
                        const simd::utf8_kernels& kernels) {
   const std::uint8_t* const p = bytes.data();
   const std::size_t n = bytes.size();
-  out_buffer out(n > kResultLimit ? kResultLimit : n + 4096);
+  out_buffer out(n + 4096, limit);
   // Placeholders of up to four bytes are written as one fixed four-byte
-  // store (the room below allows for the overhang).
+  // store (the room below allows for the overhang); longer ones get room of
+  // their own.
   const std::size_t ph_size = placeholder.size();
+  const bool short_ph = ph_size <= 4;
   std::uint8_t ph4[4] = {};
-  if (ph_size <= 4) std::memcpy(ph4, placeholder.data(), ph_size);
-  const std::size_t per_byte = ph_size > 4 ? ph_size : 4;  // most output per input byte
+  if (short_ph) std::memcpy(ph4, placeholder.data(), ph_size);
   std::size_t i = 0;
   std::size_t kernel_from = 0;  // the kernel runs again from this offset
   while (i < n) {
     if (i >= kernel_from && n - i >= kBlock) {
-      out.ensure(n - i);  // the kernel may write whole blocks up to the end
-      const std::size_t got = kernels.copy_valid(p + i, n - i, out.tail());
+      // The kernel may write whole blocks up to the end of its input, so it
+      // gets no more input than the room there is (or than kSlack).
+      std::size_t chunk = n - i;
+      if (chunk > out.room()) {
+        if (chunk > out_buffer::kSlack) chunk = out_buffer::kSlack;
+        if (!out.ensure(chunk)) return out.discard();
+      }
+      const std::size_t got = kernels.copy_valid(p + i, chunk, out.tail());
       out.commit(got);
       i += got;
       if (got == 0) kernel_from = i + kScalarStretch;
@@ -47,12 +54,11 @@ out_buffer repair_utf8(bytes_view bytes, std::string_view placeholder,
     // Byte rules from i: up to the first fault when the kernel may resume,
     // through every fault of the stretch otherwise.
     const bool stretch = i < kernel_from;
-    std::size_t limit = stretch ? kernel_from : i + kBlock;
-    if (limit > n) limit = n;
-    out.ensure((limit - i + 3) * per_byte);
-    std::uint8_t* const first = out.tail();
-    std::uint8_t* o = first;
-    while (i < limit) {
+    std::size_t stop = stretch ? kernel_from : i + kBlock;
+    if (stop > n) stop = n;
+    if (!out.ensure((stop - i + 3) * 4)) return out.discard();
+    std::uint8_t* o = out.tail();
+    while (i < stop) {
       const std::uint8_t c = p[i];
       if (c < 0x80) {
         *o++ = c;
@@ -68,17 +74,21 @@ out_buffer repair_utf8(bytes_view bytes, std::string_view placeholder,
         i += row.length;
         continue;
       }
-      if (ph_size <= 4) {
-        std::memcpy(o, ph4, 4);
-      } else {
-        std::memcpy(o, placeholder.data(), ph_size);
-      }
-      o += ph_size;
       ++i;
+      if (short_ph) {
+        std::memcpy(o, ph4, 4);
+        o += ph_size;
+      } else {
+        out.commit(static_cast<std::size_t>(o - out.tail()));
+        if (!out.ensure(ph_size + (stop - i + 3) * 4)) return out.discard();
+        out.put(placeholder);
+        o = out.tail();
+      }
       if (!stretch) break;
     }
-    out.commit(static_cast<std::size_t>(o - first));
+    out.commit(static_cast<std::size_t>(o - out.tail()));
   }
+  if (!out.fits()) return out.discard();
   return out;
 }
 

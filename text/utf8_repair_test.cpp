@@ -32,7 +32,7 @@ const simd::utf8_kernels& kernels(simd::isa level) {
 void expect_all_levels_match(std::string_view in, std::string_view placeholder) {
   const std::string want = reference::repair_utf8_reference(b(in), placeholder);
   for (const simd::isa level : simd::supported_isas()) {
-    ASSERT_EQ(repair_utf8(b(in), placeholder, kernels(level)).view(), want)
+    ASSERT_EQ(repair_utf8(b(in), placeholder, kMaxResultBytes, kernels(level)).view(), want)
         << simd::isa_name(level);
   }
 }
@@ -66,8 +66,9 @@ TEST(repair_utf8, table_boundaries) {
       // Padded past a block so that the vector kernels judge the row too.
       const std::string pad(70, 'x');
       const std::string in = pad + std::string(row.in) + pad;
-      EXPECT_EQ(repair_utf8(b(in), "?", kernels(level)).view(), pad + std::string(row.want) + pad);
-      EXPECT_EQ(repair_utf8(b(row.in), "?", kernels(level)).view(), row.want);
+      EXPECT_EQ(repair_utf8(b(in), "?", kMaxResultBytes, kernels(level)).view(),
+                pad + std::string(row.want) + pad);
+      EXPECT_EQ(repair_utf8(b(row.in), "?", kMaxResultBytes, kernels(level)).view(), row.want);
     }
   }
 }
@@ -168,7 +169,7 @@ TEST(repair_utf8, all_byte_values_and_random_bytes) {
 TEST(repair_utf8, grows_past_its_reserve) {
   const std::string in(10000, '\xFF');
   for (const simd::isa level : simd::supported_isas()) {
-    EXPECT_EQ(repair_utf8(b(in), "\xEF\xBF\xBD", kernels(level)).size(), 30000u);
+    EXPECT_EQ(repair_utf8(b(in), "\xEF\xBF\xBD", kMaxResultBytes, kernels(level)).size(), 30000u);
   }
 }
 
@@ -197,7 +198,8 @@ TEST(repair_utf8, public_stress_test) {
     const bool well_formed = row.substr(0, tab) == "true";
     for (const simd::isa level : simd::supported_isas()) {
       const std::string padded = std::string(64, 'x') + bytes + std::string(64, 'x');
-      EXPECT_EQ(repair_utf8(b(padded), "", kernels(level)).size() == padded.size(), well_formed);
+      EXPECT_EQ(repair_utf8(b(padded), "", kMaxResultBytes, kernels(level)).size() == padded.size(),
+                well_formed);
     }
   }
 }
