@@ -13,6 +13,7 @@
 #include <string>
 #include <vector>
 
+#include "binary/readable_runs.h"
 #include "common/bytes.h"
 #include "common/cpu.h"
 #include "common/scan.h"
@@ -207,6 +208,20 @@ void BM_codec(benchmark::State& state, byte_codec codec, codec_input kind, std::
   state.SetBytesProcessed(static_cast<std::int64_t>(state.iterations()) * state.range(0));
 }
 
+// Readable runs: one long run, a NUL every 96 bytes, and runs of one byte.
+void BM_readable_runs(benchmark::State& state, codec_input kind, zul::simd::isa level) {
+  const std::string in =
+      codec_input_of(kind, static_cast<std::size_t>(state.range(0)), std::string(1, '\0'));
+  const zul::scan_kernels& scan = zul::scan_for(level);
+  for (auto _ : state) {
+    std::size_t kept = 0;
+    zul::binary::for_each_readable_run(
+        zul::bytes_of(in), 0, [&](zul::bytes_view run) { kept += run.size(); }, scan);
+    benchmark::DoNotOptimize(kept);
+  }
+  state.SetBytesProcessed(static_cast<std::int64_t>(state.iterations()) * state.range(0));
+}
+
 // Each codec with the bytes that make it work; "scalar" is the plain scan.
 struct codec_row {
   const char* name;
@@ -274,6 +289,13 @@ const bool registered = [] {
                                      std::string(row.specials), level)
             ->Apply(sizes);
       }
+    }
+  }
+  for (const auto& [kind, name] : codec_inputs) {
+    for (const zul::simd::isa level : zul::simd::supported_isas()) {
+      const std::string label =
+          std::string("BM_readable_runs/") + name + "/" + zul::simd::isa_name(level);
+      benchmark::RegisterBenchmark(label.c_str(), BM_readable_runs, kind, level)->Apply(sizes);
     }
   }
   return true;
