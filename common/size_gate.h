@@ -60,12 +60,16 @@ class result_size {
   bool over_ = false;
 };
 
-// The room to reserve for output whose worst case is worst units but which
-// never passes limit units: min(worst, limit). Reserved room that is never
-// written is never touched, so reserving up to the limit costs address
-// space, not memory.
-constexpr std::size_t capped_reserve(std::uint64_t worst, std::uint64_t limit) noexcept {
-  return static_cast<std::size_t>(std::min(worst, limit));
+// The room to reserve, once, for output of at most count * each + extra
+// units that stops at limit units: that worst case, capped at the limit
+// (checked, so no product overflows). Writers reserve it up front and then
+// never grow: room that is reserved but never written is never touched, so
+// it costs address space rather than memory, and a buffer that never grows
+// is never copied (growing a 1 GiB buffer to 2 GiB holds 3 GiB at once).
+constexpr std::size_t worst_case_reserve(std::uint64_t count, std::uint64_t each,
+                                         std::uint64_t extra, std::uint64_t limit) noexcept {
+  const result_size worst = result_size(limit).add_times(count, each).add(extra);
+  return static_cast<std::size_t>(worst.fits() ? worst.bytes() : limit);
 }
 
 // The growing-output budget. Makes room in out (a std::string or

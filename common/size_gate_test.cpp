@@ -68,10 +68,12 @@ TEST(fits_result, edges) {
   EXPECT_FALSE(fits_result(4, 3));
 }
 
-TEST(capped_reserve, never_past_the_limit) {
-  EXPECT_EQ(capped_reserve(100, 50), 50u);
-  EXPECT_EQ(capped_reserve(10, 50), 10u);
-  EXPECT_EQ(capped_reserve(kMax64, kMaxResultBytes), kMaxResultBytes);
+TEST(worst_case_reserve, the_worst_case_capped_at_the_limit) {
+  EXPECT_EQ(worst_case_reserve(10, 3, 20, 50), 50u);
+  EXPECT_EQ(worst_case_reserve(10, 3, 20, 49), 49u);
+  EXPECT_EQ(worst_case_reserve(10, 3, 19, 50), 49u);
+  EXPECT_EQ(worst_case_reserve(0, 3, 7, 50), 7u);
+  EXPECT_EQ(worst_case_reserve(kMax64, kMax64, kMax64, kMaxResultBytes), kMaxResultBytes);
 }
 
 // Appending one unit at a time up to a small limit: every append within the

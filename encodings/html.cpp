@@ -1,10 +1,10 @@
 // HTML reference encoder and decoder over code points. Both reserve their
-// output once from the input length (4 bytes per character + 4 KiB; one code
-// point per character + 4 Ki), grow it only up to their result limit, and
-// make one pass. The encoder decides every
-// ASCII character from a 128-entry table per mode and looks characters from
-// U+0080 up in the entity index; the decoder copies runs without "&" whole.
-// Row-by-row references live with the tests (tests/reference/).
+// output once for the worst case (13 bytes per character; one code point per
+// character), capped at their result limit, and make one pass. The encoder
+// decides every ASCII character from a 128-entry table per mode and looks
+// characters from U+0080 up in the entity index; the decoder copies runs
+// without "&" whole. Row-by-row references live with the tests
+// (tests/reference/).
 #include "encodings/html.h"
 
 #include <array>
@@ -17,6 +17,9 @@
 
 namespace zul::encodings {
 namespace {
+
+// The longest text one character becomes: "&#4294967295;".
+constexpr std::uint64_t kMaxReferenceBytes = 13;
 
 // Each append writes nothing and says false when the output would pass
 // limit bytes.
@@ -113,7 +116,7 @@ code_points decode_html(code_point_view text, std::uint64_t limit) {
   text = skip_byte_order_mark(text);
   const std::size_t n = text.size();
   code_points out;
-  out.reserve(capped_reserve(std::uint64_t{n} + 4096, limit));
+  out.reserve(worst_case_reserve(n, 1, 0, limit));
   std::size_t i = 0;
   while (i < n) {
     std::size_t run = i;
@@ -162,7 +165,7 @@ std::string encode_html(code_point_view text, std::int64_t options, std::uint64_
   const bool keep_markup = (options & 1) != 0;
   const ascii_actions& actions = keep_markup ? kKeepMarkup : kEscapeMarkup;
   std::string out;
-  out.reserve(capped_reserve(4 * std::uint64_t{text.size()} + 4096, limit));
+  out.reserve(worst_case_reserve(text.size(), kMaxReferenceBytes, 0, limit));
   for (const std::uint32_t c : text) {
     bool fits;
     if (c < 128) {

@@ -1,6 +1,6 @@
-// Tag removal: one pass over the bytes; output reserved once for the input
-// size + 10 and grown only when a replacement text is longer than the tags
-// it stands for. A byte-set search finds the next bracket or zero byte; the
+// Tag removal: one pass over the bytes; output reserved once for the worst
+// case (every byte replaced), capped at the result limit, where removal
+// stops. A byte-set search finds the next bracket or zero byte; the
 // run before it is copied whole outside tags, and skipped whole inside tags
 // when the replacement is empty. The bytes after it, and bytes inside tags
 // with a replacement to write, go one by one.
@@ -25,7 +25,10 @@ out_buffer remove_html_tags(std::string_view utf8, std::string_view replacement,
                             std::uint64_t limit, const scan_kernels& scan) {
   const auto* p = reinterpret_cast<const std::uint8_t*>(utf8.data());
   const std::size_t n = utf8.size();
-  out_buffer out(n + 10, limit);
+  // The worst case (every byte replaced) reserved once, capped at the limit.
+  const std::size_t worst =
+      worst_case_reserve(n, replacement.size() > 1 ? replacement.size() : 1, 10, limit);
+  out_buffer out(worst + out_buffer::kSlack, limit);
   std::int64_t depth = 0;
   std::size_t after = kAfterMin;
   std::size_t i = 0;

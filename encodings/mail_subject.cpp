@@ -1,7 +1,7 @@
-// Mail subject encoding: one pass with output reserved once (2 bytes per
-// input byte + 20, enough for mostly-ASCII subjects), grown when needed
-// but never past the result limit. Control bytes are encoded too, since RFC 2047 allows no tab or
-// control byte unencoded inside an encoded word.
+// Mail subject encoding: one pass with output reserved once for the worst
+// case (3 bytes per input byte + 12), capped at the result limit, where
+// encoding stops. Control bytes are encoded too, since RFC 2047 allows no
+// tab or control byte unencoded inside an encoded word.
 #include "encodings/mail_subject.h"
 
 #include "common/hex_digits.h"
@@ -19,7 +19,7 @@ bool subject_needs_encoding(std::string_view utf8) {
 
 std::string encode_mail_subject(std::string_view utf8, std::uint64_t limit) {
   std::string out;
-  out.reserve(capped_reserve(2 * std::uint64_t{utf8.size()} + 20, limit));
+  out.reserve(worst_case_reserve(utf8.size(), 3, 12, limit));
   if (!make_room(out, 10, limit)) return {};
   out += "=?utf-8?Q?";
   for (const char c : utf8) {

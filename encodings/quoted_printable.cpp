@@ -1,6 +1,6 @@
 // Quoted-printable: a byte-class table drives the encoder (one look-up per
-// byte); output is reserved once for input length + 1 KiB and grows only
-// for inputs dense in encoded bytes, never past the result limit. The decoder copies runs without
+// byte); output is reserved once for the worst case, capped at the result
+// limit, where encoding stops. The decoder copies runs without
 // "=", CR or LF whole.
 #include "encodings/quoted_printable.h"
 
@@ -38,7 +38,8 @@ class encoder {
  public:
   encoder(std::size_t input_size, std::int64_t line_length, std::uint64_t limit)
       : line_length_(line_length), limit_(limit) {
-    out_.reserve(capped_reserve(std::uint64_t{input_size} + 1024, limit));
+    // Every input byte writes at most 6 bytes (a soft break and "=XX").
+    out_.reserve(worst_case_reserve(input_size, 6, 16, limit));
   }
 
   // True once some output was refused because it would pass the limit.

@@ -79,7 +79,7 @@ out_buffer encode_url(std::string_view in, std::int64_t options, std::uint64_t l
   const auto* p = reinterpret_cast<const std::uint8_t*>(in.data());
   const std::size_t n = in.size();
   if (!fits_result(n, limit)) return out_buffer(0);  // every byte gives at least one
-  out_buffer out(result_size().add_times(3, n).add(10).fits() ? 3 * n + 10 : limit, limit);
+  out_buffer out(worst_case_reserve(n, 3, 10, limit) + out_buffer::kSlack, limit);
   std::size_t i = 0;
   std::size_t after = kAfterMin;
   while (i < n) {

@@ -1,5 +1,5 @@
-// XML escaping: one pass, output reserved once (one code point per input
-// character + 4 Ki, grown only up to the result limit); the five markup
+// XML escaping: one pass, output reserved once for the worst case (6 code
+// points per character), capped at the result limit; the five markup
 // characters are the only ones XML 1.0 text needs escaped. The readiness
 // test is one byte-set search (vector kernels) for the first byte that is
 // not allowed.
@@ -43,7 +43,7 @@ code_points encode_xml(code_point_view text, std::int64_t options, std::uint64_t
   text = skip_byte_order_mark(text);
   const bool named_apostrophe = (options & 1) != 0;
   code_points out;
-  out.reserve(capped_reserve(std::uint64_t{text.size()} + 4096, limit));
+  out.reserve(worst_case_reserve(text.size(), 6, 0, limit));
   for (const std::uint32_t c : text) {
     bool fits = true;
     switch (c) {

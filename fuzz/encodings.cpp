@@ -50,7 +50,17 @@ extern "C" int LLVMFuzzerTestOneInput(const std::uint8_t* data, std::size_t size
       }
       break;
     case 2: {
-      const std::vector<std::uint32_t> text(in.begin(), in.end());
+      // One code point per input byte (U+0000..U+00FF, read unsigned), or
+      // with options bit 1 one per three bytes, anywhere up to U+10FFFF.
+      std::vector<std::uint32_t> text;
+      const std::uint8_t* p = data + 1;
+      if (options & 2) {
+        for (std::size_t k = 0; k + 3 <= in.size(); k += 3) {
+          text.push_back((p[k] << 16 | p[k + 1] << 8 | p[k + 2]) % 0x110000);
+        }
+      } else {
+        text.assign(p, p + in.size());
+      }
       check(enc::encode_html(text, options) ==
             zul::reference::encode_html_reference(text, options));
       check(enc::decode_html(text) == zul::reference::decode_html_reference(text));

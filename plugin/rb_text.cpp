@@ -96,9 +96,13 @@ void rbText::reset_slot(Slot slot) {
 }
 
 bool rbText::take_copy(Slot slot, const void* src, std::size_t units, std::size_t unit) {
-  // Zero-filled with room for a terminating zero unit (and then some).
-  void* buffer = std::calloc(units * unit + 4 * unit, 1);
   reset_slot(slot);
+  // units comes from a length the host reports: a count whose buffer (with
+  // four spare units) has no size, or that a signed length cannot hold, is
+  // a failed allocation.
+  if (units > SIZE_MAX / unit - 4 || units > static_cast<std::uint64_t>(INT64_MAX)) return false;
+  // Zero-filled with room for a terminating zero unit (and then some).
+  void* buffer = std::calloc(units + 4, unit);
   if (!buffer) return false;
   if (units) std::memcpy(buffer, src, units * unit);
   owned_[slot] = buffer;
@@ -210,6 +214,7 @@ void rbText::derive_utf32_from_utf16() {
   reset_slot(kUTF32);
   const std::int64_t n = lengths_[kUTF16];
   if (n < 1) return;
+  // n is at most the UTF-16 slot's unit count, which take_copy bounded.
   auto* out = static_cast<std::uint32_t*>(std::calloc(static_cast<std::size_t>(n) + 4, 4));
   if (!out) return;
   const auto* in = static_cast<const std::uint16_t*>(pointers_[kUTF16]);

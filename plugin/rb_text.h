@@ -44,6 +44,7 @@ class rbText {
   }
 
   bool is_ascii() const { return is_ascii_; }
+  // True when the host could not give the text in the form asked for.
   bool host_failed() const { return host_failed_; }
 
  private:

@@ -27,11 +27,14 @@ out_buffer repair_utf8(bytes_view bytes, std::string_view placeholder, std::uint
                        const simd::utf8_kernels& kernels) {
   const std::uint8_t* const p = bytes.data();
   const std::size_t n = bytes.size();
-  out_buffer out(n + 4096, limit);
+  const std::size_t ph_size = placeholder.size();
+  // The worst case (every byte replaced) reserved once, capped at the
+  // limit, plus room for the kernels' whole-block and four-byte stores.
+  const std::size_t worst = worst_case_reserve(n, ph_size > 1 ? ph_size : 1, 4096, limit);
+  out_buffer out(worst + out_buffer::kSlack, limit);
   // Placeholders of up to four bytes are written as one fixed four-byte
   // store (the room below allows for the overhang); longer ones get room of
   // their own.
-  const std::size_t ph_size = placeholder.size();
   const bool short_ph = ph_size <= 4;
   std::uint8_t ph4[4] = {};
   if (short_ph) std::memcpy(ph4, placeholder.data(), ph_size);

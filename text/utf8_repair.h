@@ -25,10 +25,10 @@ std::size_t well_formed_prefix(bytes_view bytes) noexcept;
 
 // bytes with each byte that begins no well-formed sequence replaced by
 // placeholder (an empty placeholder drops such bytes), using the block
-// kernels of the given level. The output is reserved once at bytes.size() +
-// 4096 bytes and grows only when placeholders outgrow that; output that
-// would pass limit bytes gives "" and the repair stops there. Throws
-// std::bad_alloc when the output cannot be allocated.
+// kernels of the given level. The output is reserved once for the worst
+// case, capped at limit; output that would pass limit bytes gives "" and the
+// repair stops there. Throws std::bad_alloc when the output cannot be
+// allocated.
 out_buffer repair_utf8(bytes_view bytes, std::string_view placeholder,
                        std::uint64_t limit = kMaxResultBytes,
                        const simd::utf8_kernels& kernels = simd::utf8_active());
