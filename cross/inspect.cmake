@@ -112,7 +112,7 @@ elseif(PLATFORM MATCHES "^Linux")
   matches(deps "${needed}" "\n +([^\n]+\\.so[.0-9]*)")
   foreach(lib IN LISTS deps)
     # glibc only: libc and libm, its dynamic loader, and libdl and libpthread,
-    # which glibc kept apart from libc until 2.34 (the arm64 build targets 2.17).
+    # which glibc kept apart from libc until 2.34 (both builds target 2.17).
     if(NOT lib MATCHES "^(libc\\.so\\.6|libm\\.so\\.6|libdl\\.so\\.2|libpthread\\.so\\.0|ld-linux-(x86-64|aarch64)\\.so\\.[12])$")
       message(FATAL_ERROR "${PLATFORM}: depends on ${lib}, not a part of glibc")
     endif()
@@ -124,7 +124,7 @@ elseif(PLATFORM MATCHES "^Linux")
   list(SORT glibc COMPARE NATURAL ORDER DESCENDING)
   list(GET glibc 0 newest)
   set(min "glibc ${newest}")
-  if(PLATFORM MATCHES "arm64" AND newest VERSION_GREATER "2.17")
+  if(newest VERSION_GREATER "2.17")
     message(FATAL_ERROR "${PLATFORM}: needs glibc ${newest}, expected 2.17 at most")
   endif()
 else()
