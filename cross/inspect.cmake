@@ -1,8 +1,10 @@
 # Inspects one built plug-in library with the LLVM tools and fails unless it
 # is what the host loads on its platform: the right file type and
 # architecture, exactly one exported symbol (REALPluginMain), system
-# libraries only, and the promised minimum OS version. Run with cmake -P:
-#   -DPLATFORM="Mac x86-64" -DLIBRARY=/path/to/StringGlobalsZUL.dylib
+# libraries only, and the promised minimum OS version; for Mach-O also the
+# loader's checks of macho_check (libSystem only, arm64 signature). Run with
+# cmake -P:
+#   -DPLATFORM="Mac x86-64" -DLIBRARY=/path/to/StringGlobalsZUL.dylib -DMACHO_CHECK=<macho_check>
 cmake_minimum_required(VERSION 3.25)
 
 function(run out)
@@ -66,6 +68,11 @@ if(PLATFORM MATCHES "^Mac")
     expect("${arch} dependencies" "${deps}" "/usr/lib/libSystem.B.dylib")
   endforeach()
   set(min "${min_list}")
+  # Every load command and the arm64 code signature, page by page.
+  run(macho "${MACHO_CHECK}" "${LIBRARY}")
+  string(STRIP "${macho}" macho)
+  string(REPLACE "\n" "; " macho "${macho}")
+  set(min "${min}; ${macho}")
 
 elseif(PLATFORM MATCHES "^Windows")
   if(PLATFORM MATCHES "x86-64")
