@@ -11,10 +11,12 @@
 #include "binary/bitwise.h"
 #include "binary/hex.h"
 #include "binary/readable_runs.h"
+#include "tests/reference/bitwise_reference.h"
+#include "tests/reference/hex_reference.h"
 
 namespace {
 
-using zul::binary::bytes_view;
+using zul::bytes_view;
 namespace detail = zul::binary::detail;
 
 std::vector<std::uint8_t> noise(std::size_t n) {
@@ -37,10 +39,9 @@ void BM_and_with_mask(benchmark::State& state) {
 void BM_and_byte_rule(benchmark::State& state) {
   const auto data = noise(static_cast<std::size_t>(state.range(0)));
   const auto mask = noise(static_cast<std::size_t>(state.range(1)));
-  std::vector<std::uint8_t> out(data.size());
   for (auto _ : state) {
-    detail::combine_scalar(detail::bit_op::kAnd, data, mask, 0, out.data());
-    benchmark::DoNotOptimize(out.data());
+    benchmark::DoNotOptimize(
+        zul::reference::combine_reference(detail::bit_op::kAnd, data, mask, 0));
   }
   state.SetBytesProcessed(state.iterations() * state.range(0));
 }
@@ -55,10 +56,9 @@ void BM_xor_with_mask(benchmark::State& state) {
 void BM_xor_byte_rule(benchmark::State& state) {
   const auto data = noise(static_cast<std::size_t>(state.range(0)));
   const auto mask = noise(static_cast<std::size_t>(state.range(1)));
-  std::vector<std::uint8_t> out(data.size());
   for (auto _ : state) {
-    detail::combine_scalar(detail::bit_op::kXor, data, mask, 3 % mask.size(), out.data());
-    benchmark::DoNotOptimize(out.data());
+    benchmark::DoNotOptimize(
+        zul::reference::combine_reference(detail::bit_op::kXor, data, mask, 3 % mask.size()));
   }
   state.SetBytesProcessed(state.iterations() * state.range(0));
 }
@@ -69,13 +69,9 @@ void BM_encode_hex(benchmark::State& state) {
   state.SetBytesProcessed(state.iterations() * state.range(0));
 }
 
-void BM_encode_hex_scalar(benchmark::State& state) {
+void BM_encode_hex_reference(benchmark::State& state) {
   const auto data = noise(static_cast<std::size_t>(state.range(0)));
-  std::string out(2 * data.size(), '\0');
-  for (auto _ : state) {
-    detail::encode_hex_scalar(data, out.data());
-    benchmark::DoNotOptimize(out.data());
-  }
+  for (auto _ : state) benchmark::DoNotOptimize(zul::reference::encode_hex_reference(data));
   state.SetBytesProcessed(state.iterations() * state.range(0));
 }
 
@@ -104,7 +100,7 @@ BENCHMARK(BM_and_byte_rule)->Apply(bitwise_sizes);
 BENCHMARK(BM_xor_with_mask)->Apply(bitwise_sizes);
 BENCHMARK(BM_xor_byte_rule)->Apply(bitwise_sizes);
 BENCHMARK(BM_encode_hex)->Arg(1 << 10)->Arg(1 << 20);
-BENCHMARK(BM_encode_hex_scalar)->Arg(1 << 10)->Arg(1 << 20);
+BENCHMARK(BM_encode_hex_reference)->Arg(1 << 10)->Arg(1 << 20);
 BENCHMARK(BM_readable_runs)->Args({1 << 20, 0})->Args({1 << 20, 1});
 
 }  // namespace

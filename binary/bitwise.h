@@ -1,8 +1,8 @@
 // Bitwise combination of a data string with a repeating mask: AND, OR, XOR,
 // and XOR mixed with each byte's position. The data sets the result length;
 // the mask repeats from its start (or from a chosen offset for XOR) and is
-// cut at the data's end. Every function has a byte-at-a-time reference in
-// detail:: that the word-at-a-time paths are tested against.
+// cut at the data's end. The word-at-a-time paths are tested against a
+// byte-at-a-time reference kept with the tests (tests/reference/).
 #pragma once
 
 #include <cstddef>
@@ -10,9 +10,9 @@
 #include <span>
 #include <string>
 
-namespace zul::binary {
+#include "common/bytes.h"
 
-using bytes_view = std::span<const std::uint8_t>;
+namespace zul::binary {
 
 // data[i] AND mask[i mod m]. Empty data or an empty mask give "".
 std::string and_with_mask(bytes_view data, bytes_view mask);
@@ -37,14 +37,9 @@ enum class bit_op { kAnd, kOr, kXor };
 // The mask index that meets data byte 0: offset floored modulo m (m >= 1).
 std::size_t mask_start(std::int64_t offset, std::size_t m);
 
-// The byte rule, one byte at a time: out[i] = data[i] op mask[(start + i) mod
-// m], for i < data.size(). out has room for data.size() bytes; m >= 1 and
-// start < m. The reference that the fast paths must match.
-void combine_scalar(bit_op op, bytes_view data, bytes_view mask, std::size_t start,
-                    std::uint8_t* out);
-
-// The same result as combine_scalar, eight bytes at a time where the mask
-// allows it; out may be data.data() itself.
+// The byte rule out[i] = data[i] op mask[(start + i) mod m], for i <
+// data.size(), in long runs of the machine's run kernel. out has room
+// for data.size() bytes and may be data.data() itself; m >= 1 and start < m.
 void combine_fast(bit_op op, bytes_view data, bytes_view mask, std::size_t start,
                   std::uint8_t* out);
 

@@ -5,7 +5,11 @@
 
 #include <gtest/gtest.h>
 
+#include <algorithm>
+#include <string>
 #include <vector>
+
+#include "tests/reference/bitwise_reference.h"
 
 namespace zul::binary {
 namespace {
@@ -32,13 +36,37 @@ TEST(combine_fast, matches_byte_rule) {
           const bytes_view data(data_pool.data() + skew, n);
           const bytes_view mask(mask_pool.data() + 7 - skew, m);
           for (std::size_t start = 0; start < m; start += (m > 9 ? 7 : 1)) {
-            std::vector<std::uint8_t> want(n + 8, 0xEE), got(n + 8, 0xEE);
-            detail::combine_scalar(op, data, mask, start, want.data());
+            const std::string rule = reference::combine_reference(op, data, mask, start);
+            std::vector<std::uint8_t> want(rule.begin(), rule.end()), got(n + 8, 0xEE);
+            want.resize(n + 8, 0xEE);
             detail::combine_fast(op, data, mask, start, got.data());
             ASSERT_EQ(got, want) << "op " << static_cast<int>(op) << " m " << m << " n " << n
                                  << " start " << start << " skew " << skew;
           }
         }
+      }
+    }
+  }
+}
+
+// Data longer than the repeated-mask pattern: segments wrap many times,
+// for masks shorter and longer than the pattern and every kind of start.
+TEST(combine_fast, long_data_wraps_the_mask) {
+  const auto data_pool = noise(5000, 4);
+  const auto mask_pool = noise(3000, 5);
+  for (std::size_t m : {1u, 3u, 7u, 64u, 1000u, 1023u, 1025u, 3000u}) {
+    for (std::size_t n : {1500u, 4999u}) {
+      for (std::size_t start : {std::size_t{0}, m / 2, m - 1}) {
+        const bytes_view data(data_pool.data(), n);
+        const bytes_view mask(mask_pool.data(), m);
+        const std::string rule =
+            reference::combine_reference(detail::bit_op::kXor, data, mask, start);
+        std::vector<std::uint8_t> got(n);
+        detail::combine_fast(detail::bit_op::kXor, data, mask, start, got.data());
+        ASSERT_TRUE(
+            std::equal(got.begin(), got.end(), rule.begin(),
+                       [](std::uint8_t g, char w) { return g == static_cast<std::uint8_t>(w); }))
+            << "m " << m << " n " << n << " start " << start;
       }
     }
   }

@@ -9,10 +9,12 @@
 
 namespace zul::binary {
 
-std::string concat_bytes(std::span<const std::span<const std::uint8_t>> parts) {
-  std::size_t total = 0;
-  for (const auto& part : parts) total += part.size();
-  std::string out(total, '\0');
+std::string concat_bytes(std::span<const std::span<const std::uint8_t>> parts,
+                         std::uint64_t limit) {
+  result_size total(limit);
+  for (const auto& part : parts) total.add(part.size());
+  if (!total.fits()) return {};
+  std::string out(total.bytes(), '\0');
   char* p = out.data();
   for (const auto& part : parts) {
     if (part.empty()) continue;

@@ -10,11 +10,14 @@
 #include <span>
 #include <string>
 
+#include "common/size_gate.h"
+
 namespace zul::binary {
 
 // The parts' bytes one after another, nothing between them; "" when all are
-// empty.
-std::string concat_bytes(std::span<const std::span<const std::uint8_t>> parts);
+// empty, and "" without allocating when the total would pass limit bytes.
+std::string concat_bytes(std::span<const std::span<const std::uint8_t>> parts,
+                         std::uint64_t limit = kMaxResultBytes);
 
 // length bytes of pattern repeated from its start, the last copy cut at the
 // length; length zero bytes when pattern is empty.

@@ -11,9 +11,6 @@
 
 namespace zul::binary {
 
-// The digit for each value 0..15.
-inline constexpr char kHexDigits[] = "0123456789ABCDEF";
-
 // 2 * bytes.size() upper-case digits; "" for no bytes.
 std::string encode_hex(std::span<const std::uint8_t> bytes);
 
@@ -21,15 +18,4 @@ std::string encode_hex(std::span<const std::uint8_t> bytes);
 // count 0); "" when text has fewer than two characters.
 std::string decode_hex(std::string_view text);
 
-namespace detail {
-
-// The digit value of c, 0 for a character that is not a hex digit.
-std::uint8_t hex_value(char c);
-
-// One byte at a time through kHexDigits: the reference encode_hex (which
-// writes two digits per table load) is tested against. out has room for
-// 2 * bytes.size() characters.
-void encode_hex_scalar(std::span<const std::uint8_t> bytes, char* out);
-
-}  // namespace detail
 }  // namespace zul::binary

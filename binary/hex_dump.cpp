@@ -1,25 +1,16 @@
-// Hex dumps are sized once, up front, with saturating 64-bit arithmetic, so a
+// Hex dumps are sized once, up front, with checked 64-bit arithmetic, so a
 // huge linelen * hexlen is refused before anything is allocated. The digit
 // text is built once (digits plus exactly the filler the last line needs) and
 // copied out group by group, or line by line when there is no spacer.
 #include "binary/hex_dump.h"
 
 #include <cstring>
-#include <limits>
 
 #include "binary/hex.h"
+#include "common/size_gate.h"
 
 namespace zul::binary {
 namespace {
-
-constexpr std::uint64_t kSaturated = std::numeric_limits<std::uint64_t>::max();
-
-std::uint64_t saturating_add(std::uint64_t a, std::uint64_t b) {
-  return a > kSaturated - b ? kSaturated : a + b;
-}
-std::uint64_t saturating_mul(std::uint64_t a, std::uint64_t b) {
-  return b != 0 && a > kSaturated / b ? kSaturated : a * b;
-}
 
 char* put(char* out, std::string_view text) {
   if (!text.empty()) std::memcpy(out, text.data(), text.size());
@@ -34,15 +25,15 @@ std::uint64_t hex_dump_length(std::uint64_t input_size, const hex_dump_layout& l
   if (input_size == 0 || layout.hexlen < 1 || layout.linelen < 1) return 0;
   const auto hexlen = static_cast<std::uint64_t>(layout.hexlen);
   const auto linelen = static_cast<std::uint64_t>(layout.linelen);
-  const std::uint64_t groups_chars = saturating_mul(hexlen, linelen);
-  std::uint64_t line = saturating_add(layout.linestart.size(), layout.lineend.size());
-  line = saturating_add(line, groups_chars);
-  line = saturating_add(line, saturating_mul(linelen - 1, layout.spacer.size()));
-  if (line > kMaxDumpLength) return 0;
-  const std::uint64_t digits = saturating_mul(input_size, 2);
+  result_size line(kMaxDumpLength);
+  line.add(layout.linestart.size()).add(layout.lineend.size());
+  line.add_times(hexlen, linelen).add_times(linelen - 1, layout.spacer.size());
+  if (!line.fits()) return 0;
+  // hexlen * linelen fits: it is part of the line.
+  const std::uint64_t groups_chars = hexlen * linelen;
+  const std::uint64_t digits = 2 * input_size;  // a span's size is below 2^63
   const std::uint64_t lines = digits / groups_chars + (digits % groups_chars != 0);
-  const std::uint64_t total = saturating_mul(lines, line);
-  return total > kMaxDumpLength ? 0 : total;
+  return result_size(kMaxDumpLength).add_times(lines, line.bytes()).bytes();
 }
 
 }  // namespace detail

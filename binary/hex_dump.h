@@ -11,6 +11,8 @@
 #include <string>
 #include <string_view>
 
+#include "common/size_gate.h"
+
 namespace zul::binary {
 
 struct hex_dump_layout {
@@ -23,7 +25,7 @@ struct hex_dump_layout {
 };
 
 // Results longer than this are never built (the host's string length limit).
-inline constexpr std::uint64_t kMaxDumpLength = 0x7FFFFFFF;
+inline constexpr std::uint64_t kMaxDumpLength = kMaxResultBytes;
 
 // The dump of input: ceil(2n / (linelen * hexlen)) lines. Empty input, a
 // hexlen or linelen below 1, or a dump longer than kMaxDumpLength give ""

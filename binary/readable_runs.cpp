@@ -6,30 +6,21 @@
 
 #include <array>
 
+#include "common/utf8.h"
+
 namespace zul::binary::detail {
 namespace {
 
-struct unit_class {
-  std::uint8_t length;  // 0: ends a run; 1: one-byte unit; 2..4: lead byte
-  std::uint8_t low;     // allowed range of the second byte of a lead byte
-  std::uint8_t high;
-};
-
-constexpr std::array<unit_class, 256> kUnits = [] {
-  std::array<unit_class, 256> t{};
-  t[0x09] = t[0x0A] = t[0x0D] = {1, 0, 0};
-  for (int b = 0x20; b <= 0x7E; ++b) t[b] = {1, 0, 0};
-  for (int b = 0xC2; b <= 0xDF; ++b) t[b] = {2, 0x80, 0xBF};
-  t[0xE0] = {3, 0xA0, 0xBF};
-  for (int b = 0xE1; b <= 0xEF; ++b) t[b] = {3, 0x80, 0xBF};
-  t[0xED] = {3, 0x80, 0x9F};
-  t[0xF0] = {4, 0x90, 0xBF};
-  for (int b = 0xF1; b <= 0xF3; ++b) t[b] = {4, 0x80, 0xBF};
-  t[0xF4] = {4, 0x80, 0x8F};
+// The UTF-8 lead table with the ASCII rows changed: only tab, line feed,
+// carriage return and 0x20..0x7E are one-byte units; every other ASCII byte
+// (length 0) ends a run.
+constexpr std::array<utf8_lead, 256> kUnits = [] {
+  std::array<utf8_lead, 256> t = kUtf8Leads;
+  for (int b = 0x00; b <= 0x7F; ++b) t[b].length = 0;
+  t[0x09].length = t[0x0A].length = t[0x0D].length = 1;
+  for (int b = 0x20; b <= 0x7E; ++b) t[b].length = 1;
   return t;
 }();
-
-bool is_continuation(std::uint8_t b) { return (b & 0xC0) == 0x80; }
 
 }  // namespace
 
@@ -40,7 +31,7 @@ run_measure measure_run(std::span<const std::uint8_t> data, std::size_t pos) {
   bool visible = false;
   while (i < n) {
     const std::uint8_t b = d[i];
-    const unit_class unit = kUnits[b];
+    const utf8_lead unit = kUnits[b];
     if (unit.length == 1) {
       visible |= b > 0x20;
       ++i;
@@ -48,9 +39,9 @@ run_measure measure_run(std::span<const std::uint8_t> data, std::size_t pos) {
     }
     if (unit.length == 0 || unit.length > n - i) break;
     const std::uint8_t second = d[i + 1];
-    if (second < unit.low || second > unit.high) break;
-    if (unit.length >= 3 && !is_continuation(d[i + 2])) break;
-    if (unit.length == 4 && !is_continuation(d[i + 3])) break;
+    if (second < unit.second_low || second > unit.second_high) break;
+    if (unit.length >= 3 && !is_utf8_continuation(d[i + 2])) break;
+    if (unit.length == 4 && !is_utf8_continuation(d[i + 3])) break;
     visible = true;
     i += unit.length;
   }

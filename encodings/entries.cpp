@@ -2,7 +2,8 @@
 // arguments (rbData for stored bytes, rbText for text in a known form),
 // calls the pure worker and builds the host result with its encoding.
 // Functions whose failures are reported run inside the shared trap; the
-// others give their empty result silently when a buffer cannot be had.
+// others run inside the silent policy and give their empty result when a
+// buffer cannot be had.
 // Nothing here keeps state between calls, so calls from several threads
 // are independent.
 #include <cstdint>
@@ -35,6 +36,25 @@ REALstring same_string(REALstring s) {
   return s;
 }
 
+// The stored bytes of s through a byte decoder, as bytes without a declared
+// encoding; no bytes give the null string.
+template <class Decode>
+REALstring decode_stored_bytes(REALstring s, Decode decode) {
+  rbData in(s);
+  if (in.length < 1) return nullptr;
+  return build_string(decode(in.view()), kUnknown);
+}
+
+// fn of the code points of s; no characters give the null string.
+template <class Fn>
+REALstring with_code_points(REALstring s, Fn fn) {
+  rbText text(s);
+  text.ConvertUTF32();
+  const auto chars = text.utf32();
+  if (chars.empty()) return nullptr;
+  return fn(chars);
+}
+
 REALstring build_utf32(const enc::code_points& text) {
   return REALBuildUnicodeString(text.data(), static_cast<std::int64_t>(text.size() * 4), kUTF32);
 }
@@ -42,81 +62,81 @@ REALstring build_utf32(const enc::code_points& text) {
 }  // namespace
 
 // URL percent-encoding. Space and "+" follow this call's options only.
-REALstring EncodingToURL2(REALstring s, int64_t options) {
+REALstring EncodingToURL2(REALstring s, std::int64_t options) noexcept {
   if (!s) return nullptr;
-  rbData in(s);
-  return quietly<REALstring>(
-      nullptr, [&] { return build_string(enc::encode_url(in.view(), options), kASCII); });
+  return quietly<REALstring>(nullptr, [&] {
+    rbData in(s);
+    return build_string(enc::encode_url(in.view(), options), kASCII);
+  });
 }
 
-REALstring EncodingToURL1(REALstring s) { return EncodingToURL2(s, 0); }
+REALstring EncodingToURL1(REALstring s) noexcept { return EncodingToURL2(s, 0); }
 
-REALstring DecodingToURL2(REALstring s, int64_t options) {
+REALstring DecodingToURL2(REALstring s, std::int64_t options) noexcept {
   if (!s) return nullptr;
-  rbData in(s);
-  if (in.length < 1) return nullptr;
-  return quietly<REALstring>(
-      nullptr, [&] { return build_string(enc::decode_url(in.view(), options), kUnknown); });
+  return quietly<REALstring>(nullptr, [&] {
+    return decode_stored_bytes(s,
+                               [&](std::string_view in) { return enc::decode_url(in, options); });
+  });
 }
 
-REALstring DecodingToURL1(REALstring s) { return DecodingToURL2(s, 0); }
+REALstring DecodingToURL1(REALstring s) noexcept { return DecodingToURL2(s, 0); }
 
 // HTML character references over the string's code points.
-REALstring EncodingToHTML(REALstring s, int64_t options) {
+REALstring EncodingToHTML(REALstring s, std::int64_t options) noexcept {
   if (!s) return nullptr;
-  return trapped<REALstring>(nullptr, [&]() -> REALstring {
-    rbText text(s);
-    text.ConvertUTF32();
-    const auto chars = text.utf32();
-    if (chars.empty()) return nullptr;
-    if (!enc::html_needs_escaping(chars)) return same_string(s);
-    return build_string(enc::encode_html(chars, options), kASCII);
+  return trapped<REALstring>(nullptr, [&] {
+    return with_code_points(s, [&](enc::code_point_view chars) {
+      if (!enc::html_needs_escaping(chars)) return same_string(s);
+      return build_string(enc::encode_html(chars, options), kASCII);
+    });
   });
 }
 
 // Registered as both "DecodingFromHTMLZUL" and "DecodingFromXMLZUL".
-REALstring DecodingToHTML(REALstring s) {
+REALstring DecodingToHTML(REALstring s) noexcept {
   if (!s) return nullptr;
-  return trapped<REALstring>(nullptr, [&]() -> REALstring {
-    rbText text(s);
-    text.ConvertUTF32();
-    const auto chars = text.utf32();
-    if (chars.empty()) return nullptr;
-    return build_utf32(enc::decode_html(chars));
+  return trapped<REALstring>(nullptr, [&] {
+    return with_code_points(
+        s, [](enc::code_point_view chars) { return build_utf32(enc::decode_html(chars)); });
   });
 }
 
-REALstring EncodingToXML(REALstring s, int64_t options) {
+REALstring EncodingToXML(REALstring s, std::int64_t options) noexcept {
   if (!s) return nullptr;
-  return trapped<REALstring>(nullptr, [&]() -> REALstring {
-    rbText text(s);
-    text.ConvertUTF32();
-    const auto chars = text.utf32();
-    if (chars.empty()) return nullptr;
-    if (!enc::xml_needs_escaping(chars)) return same_string(s);
-    return build_utf32(enc::encode_xml(chars, options));
+  return trapped<REALstring>(nullptr, [&] {
+    return with_code_points(s, [&](enc::code_point_view chars) {
+      if (!enc::xml_needs_escaping(chars)) return same_string(s);
+      return build_utf32(enc::encode_xml(chars, options));
+    });
   });
 }
 
-// Ready means: stored as ASCII-compatible text and holding only bytes 1..127
-// other than the five markup characters.
+// Ready means: empty, or stored as ASCII-compatible text and holding only
+// bytes 1..127 other than the five markup characters. An empty string is
+// ready whatever its encoding tag: there is nothing in it to escape.
 static bool is_markup_ready(REALstring s) {
   if (!s) return true;
+  rbData in(s);
+  if (in.empty()) return true;
   bool available = false;
   const std::uint32_t encoding = REALGetStringEncoding(s, &available);
   if (available && encoding != kMacRoman && encoding != kWindowsLatin1 && encoding != kASCII &&
       encoding != kUTF8) {
     return false;
   }
-  rbData in(s);
   return enc::is_markup_free_ascii(in.view());
 }
 
-bool StringIsHTMLready(REALstring s) { return is_markup_ready(s); }
-bool StringIsXMLready(REALstring s) { return is_markup_ready(s); }
+bool StringIsHTMLready(REALstring s) noexcept {
+  return quietly(false, [&] { return is_markup_ready(s); });
+}
+bool StringIsXMLready(REALstring s) noexcept {
+  return quietly(false, [&] { return is_markup_ready(s); });
+}
 
 // Quoted-printable over the stored bytes.
-REALstring EncodingToQuotedPrintable2(REALstring s, int64_t line_length) {
+REALstring EncodingToQuotedPrintable2(REALstring s, std::int64_t line_length) noexcept {
   if (!s) return nullptr;
   return trapped<REALstring>(nullptr, [&] {
     rbData in(s);
@@ -124,7 +144,7 @@ REALstring EncodingToQuotedPrintable2(REALstring s, int64_t line_length) {
   });
 }
 
-REALstring DecodingToQuotedPrintable(REALstring s) {
+REALstring DecodingToQuotedPrintable(REALstring s) noexcept {
   if (!s) return nullptr;
   return trapped<REALstring>(nullptr, [&] {
     rbData in(s);
@@ -133,41 +153,39 @@ REALstring DecodingToQuotedPrintable(REALstring s) {
 }
 
 // A subject of printable ASCII (the empty one included) comes back as it is.
-REALstring EncodeEmailSubjectZUL(REALstring s) {
+// A subject the host cannot give as UTF-8 (a lone surrogate, odd-length
+// UTF-16, invalid UTF-32) gives null: its stored bytes could not go into a
+// mail header either.
+REALstring EncodeEmailSubjectZUL(REALstring s) noexcept {
   if (!s) return nullptr;
   return trapped<REALstring>(nullptr, [&]() -> REALstring {
     rbText text(s);
     const std::string_view utf8 = text.utf8();
+    if (text.host_failed()) return nullptr;
     if (!enc::subject_needs_encoding(utf8)) return same_string(s);
     return build_string(enc::encode_mail_subject(utf8), kASCII);
   });
 }
 
 // yEnc data bytes.
-REALstring yDecodeZULs(REALstring data) {
+REALstring yDecodeZULs(REALstring data) noexcept {
   if (!data) return nullptr;
-  rbData in(data);
-  if (in.length < 1) return nullptr;
-  return quietly<REALstring>(nullptr,
-                             [&] { return build_string(enc::decode_yenc(in.view()), kUnknown); });
+  return quietly<REALstring>(nullptr, [&] { return decode_stored_bytes(data, enc::decode_yenc); });
 }
 
-REALmemoryBlock yDecodeZULm(REALmemoryBlock data) {
+REALmemoryBlock yDecodeZULm(REALmemoryBlock data) noexcept {
   if (!data) return nullptr;
-  rbData in(data);
-  if (in.length < 1 || !in.data) return nullptr;
-  std::string decoded;
-  if (!quietly(false, [&] {
-        decoded = enc::decode_yenc(in.view());
-        return true;
-      })) {
-    return nullptr;
-  }
-  return REALNewMemoryBlock(static_cast<std::int64_t>(decoded.size()), decoded.data());
+  return quietly<REALmemoryBlock>(nullptr, [&]() -> REALmemoryBlock {
+    rbData in(data);
+    if (in.length < 1 || !in.data) return nullptr;
+    const std::string decoded = enc::decode_yenc(in.view());
+    // The block builder raises its own exception when the block cannot be had.
+    return REALNewMemoryBlock(static_cast<std::int64_t>(decoded.size()), decoded.data());
+  });
 }
 
 // Tag removal over the UTF-8 text; the replacement is read as UTF-8 too.
-REALstring RemoveHTMLTagsWith(REALstring s, REALstring replacement) {
+REALstring RemoveHTMLTagsWith(REALstring s, REALstring replacement) noexcept {
   if (!s) return nullptr;
   return trapped<REALstring>(nullptr, [&] {
     rbText text(s);
@@ -176,20 +194,18 @@ REALstring RemoveHTMLTagsWith(REALstring s, REALstring replacement) {
   });
 }
 
-REALstring RemoveHTMLTags(REALstring s) { return RemoveHTMLTagsWith(s, nullptr); }
+REALstring RemoveHTMLTags(REALstring s) noexcept { return RemoveHTMLTagsWith(s, nullptr); }
 
 // SQL helpers.
-REALstring DecodingFromMySQL(REALstring s) {
+REALstring DecodingFromMySQL(REALstring s) noexcept {
   if (!s) return nullptr;
-  rbData in(s);
-  if (in.length < 1) return nullptr;
-  return quietly<REALstring>(nullptr,
-                             [&] { return build_string(enc::decode_mysql(in.view()), kUnknown); });
+  return quietly<REALstring>(nullptr, [&] { return decode_stored_bytes(s, enc::decode_mysql); });
 }
 
-REALstring SQLReplaceBooleanZUL(REALstring sql) {
+REALstring SQLReplaceBooleanZUL(REALstring sql) noexcept {
   if (!sql) return nullptr;
-  rbText text(sql);
-  return quietly<REALstring>(
-      nullptr, [&] { return build_string(enc::replace_sql_booleans(text.utf8()), kUTF8); });
+  return quietly<REALstring>(nullptr, [&] {
+    rbText text(sql);
+    return build_string(enc::replace_sql_booleans(text.utf8()), kUTF8);
+  });
 }

@@ -1,47 +1,47 @@
 // HTML reference encoder and decoder over code points. Both reserve their
-// output once from the input length (4 bytes per character + 4 KiB; one code
-// point per character + 4 Ki) and make one pass. The encoder decides every
-// ASCII character from a 128-entry table per mode and looks characters from
-// U+0080 up in the entity index; the decoder copies runs without "&" whole.
-// The scalar versions scan the entity table row by row instead.
+// output once for the worst case (13 bytes per character; one code point per
+// character), capped at their result limit, and make one pass. The encoder
+// decides every ASCII character from a 128-entry table per mode and looks
+// characters from U+0080 up in the entity index; the decoder copies runs
+// without "&" whole. Row-by-row references live with the tests
+// (tests/reference/).
 #include "encodings/html.h"
 
 #include <array>
 #include <charconv>
 #include <string_view>
 
+#include "common/markup.h"
+#include "common/size_gate.h"
 #include "encodings/html_entities.h"
 
 namespace zul::encodings {
 namespace {
 
-bool is_byte_order_mark(std::uint32_t c) { return c == 0xFEFF || c == 0xFFFE; }
+// The longest text one character becomes: "&#4294967295;".
+constexpr std::uint64_t kMaxReferenceBytes = 13;
 
-code_point_view skip_byte_order_mark(code_point_view text) {
-  return !text.empty() && is_byte_order_mark(text[0]) ? text.subspan(1) : text;
+// Each append writes nothing and says false when the output would pass
+// limit bytes.
+bool append_text(std::string& out, std::string_view text, std::uint64_t limit) {
+  if (!make_room(out, text.size(), limit)) return false;
+  out += text;
+  return true;
 }
 
-// Controls other than tab, LF and CR are dropped from rewritten text.
-constexpr bool is_dropped_control(std::uint32_t c) {
-  return c < 32 && c != 9 && c != 10 && c != 13;
+bool append_numeric_reference(std::string& out, std::uint32_t cp, std::uint64_t limit) {
+  char text[16] = {'&', '#'};
+  char* end = std::to_chars(text + 2, text + sizeof text - 1, cp).ptr;
+  *end++ = ';';
+  return append_text(out, {text, static_cast<std::size_t>(end - text)}, limit);
 }
 
-constexpr bool is_markup(std::uint32_t c) {
-  return c == '"' || c == '&' || c == '\'' || c == '<' || c == '>';
-}
-
-void append_numeric_reference(std::string& out, std::uint32_t cp) {
-  char digits[10];
-  const auto end = std::to_chars(digits, digits + sizeof digits, cp).ptr;
-  out += "&#";
-  out.append(digits, end);
-  out += ';';
-}
-
-void append_named_reference(std::string& out, std::string_view name) {
+bool append_named_reference(std::string& out, std::string_view name, std::uint64_t limit) {
+  if (!make_room(out, name.size() + 2, limit)) return false;
   out += '&';
   out += name;
   out += ';';
+  return true;
 }
 
 // What the encoder writes for each ASCII character in one mode; an empty
@@ -75,10 +75,8 @@ constexpr ascii_actions kEscapeMarkup = make_ascii_actions(true);
 constexpr ascii_actions kKeepMarkup = make_ascii_actions(false);
 
 // The value of a reference name (the characters between "&" and ";"), or
-// nothing when the name is no reference. name_lookup maps an ASCII name to
-// its table code point.
-template <class NameLookup>
-std::optional<std::uint32_t> reference_value(code_point_view name, NameLookup name_lookup) {
+// nothing when the name is no reference.
+std::optional<std::uint32_t> reference_value(code_point_view name) {
   char ascii[8];
   bool all_ascii = true;
   for (std::size_t k = 0; k < name.size(); ++k) {
@@ -86,7 +84,7 @@ std::optional<std::uint32_t> reference_value(code_point_view name, NameLookup na
     ascii[k] = static_cast<char>(name[k]);
   }
   if (all_ascii) {
-    if (auto cp = name_lookup(std::string_view(ascii, name.size()))) return cp;
+    if (auto cp = entity_code_point(std::string_view(ascii, name.size()))) return cp;
   }
   if (name[0] != '#') return std::nullopt;
   const bool hex = name.size() >= 2 && name[1] == 'x';
@@ -112,16 +110,18 @@ std::optional<std::uint32_t> reference_value(code_point_view name, NameLookup na
   return static_cast<std::uint32_t>(value);
 }
 
-template <class NameLookup>
-code_points decode_with(code_point_view text, NameLookup name_lookup) {
+}  // namespace
+
+code_points decode_html(code_point_view text, std::uint64_t limit) {
   text = skip_byte_order_mark(text);
   const std::size_t n = text.size();
   code_points out;
-  out.reserve(n + 4096);
+  out.reserve(worst_case_reserve(n, 1, 0, limit));
   std::size_t i = 0;
   while (i < n) {
     std::size_t run = i;
     while (run < n && text[run] != '&') ++run;
+    if (!make_room(out, run - i, limit)) return {};
     out.insert(out.end(), text.begin() + static_cast<std::ptrdiff_t>(i),
                text.begin() + static_cast<std::ptrdiff_t>(run));
     i = run;
@@ -139,19 +139,19 @@ code_points decode_with(code_point_view text, NameLookup name_lookup) {
       }
     }
     if (bounded && length > 0) {
-      if (auto cp = reference_value(text.subspan(i + 1, length), name_lookup)) {
+      if (auto cp = reference_value(text.subspan(i + 1, length))) {
+        if (!make_room(out, 1, limit)) return {};
         out.push_back(*cp);
         i += length + 2;
         continue;
       }
     }
+    if (!make_room(out, 1, limit)) return {};
     out.push_back('&');
     ++i;
   }
   return out;
 }
-
-}  // namespace
 
 bool html_needs_escaping(code_point_view text) {
   for (const std::uint32_t c : text) {
@@ -160,52 +160,24 @@ bool html_needs_escaping(code_point_view text) {
   return false;
 }
 
-std::string encode_html(code_point_view text, std::int64_t options) {
+std::string encode_html(code_point_view text, std::int64_t options, std::uint64_t limit) {
   text = skip_byte_order_mark(text);
   const bool keep_markup = (options & 1) != 0;
   const ascii_actions& actions = keep_markup ? kKeepMarkup : kEscapeMarkup;
   std::string out;
-  out.reserve(4 * text.size() + 4096);
+  out.reserve(worst_case_reserve(text.size(), kMaxReferenceBytes, 0, limit));
   for (const std::uint32_t c : text) {
+    bool fits;
     if (c < 128) {
-      out += actions[c];
+      fits = append_text(out, actions[c], limit);
     } else if (const std::string_view name = entity_name(c, true); !name.empty()) {
-      append_named_reference(out, name);
+      fits = append_named_reference(out, name, limit);
     } else {
-      append_numeric_reference(out, c);
+      fits = append_numeric_reference(out, c, limit);
     }
+    if (!fits) return {};
   }
   return out;
 }
 
-code_points decode_html(code_point_view text) {
-  return decode_with(text, [](std::string_view name) { return entity_code_point(name); });
-}
-
-namespace detail {
-
-std::string encode_html_scalar(code_point_view text, std::int64_t options) {
-  text = skip_byte_order_mark(text);
-  const bool keep_markup = (options & 1) != 0;
-  std::string out;
-  out.reserve(4 * text.size() + 4096);
-  for (const std::uint32_t c : text) {
-    if (!keep_markup && c == '\'') {
-      out += "&#39;";
-    } else if (const std::string_view name = entity_name_scan(c, keep_markup); !name.empty()) {
-      append_named_reference(out, name);
-    } else if (c >= 128) {
-      append_numeric_reference(out, c);
-    } else if (!is_dropped_control(c)) {
-      out += static_cast<char>(c);
-    }
-  }
-  return out;
-}
-
-code_points decode_html_scalar(code_point_view text) {
-  return decode_with(text, [](std::string_view name) { return entity_code_point_scan(name); });
-}
-
-}  // namespace detail
 }  // namespace zul::encodings

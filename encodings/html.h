@@ -11,10 +11,15 @@
 #include <string>
 #include <vector>
 
+#include "common/size_gate.h"
+
 namespace zul::encodings {
 
 using code_point_view = std::span<const std::uint32_t>;
 using code_points = std::vector<std::uint32_t>;
+
+// Code-point results go to the host as UTF-32: four bytes each.
+inline constexpr std::uint64_t kMaxResultCodePoints = kMaxResultBytes / 4;
 
 // True when text holds a double quote, "&", an apostrophe, "<", ">" or a
 // character above U+007F anywhere in its whole length (a U+0000 does not
@@ -26,22 +31,17 @@ bool html_needs_escaping(code_point_view text);
 // five are copied as they are. In both modes characters below U+0020 other
 // than tab, LF and CR are dropped, other ASCII is copied, and characters
 // from U+0080 up become "&name;" or "&#N;" (decimal). Output is ASCII, at
-// most 11 bytes per character; empty text gives an empty result.
-std::string encode_html(code_point_view text, std::int64_t options);
+// most 11 bytes per character; empty text gives an empty result, and so
+// does output that would pass limit bytes (encoding stops there).
+std::string encode_html(code_point_view text, std::int64_t options,
+                        std::uint64_t limit = kMaxResultBytes);
 
 // Decodes references: "&" + name + ";" with a name of 1 to 8 characters (at
 // the very end of the text the ";" may be missing). A name of the table
 // gives its code point; "#" + decimal digits or "#x" + hex digits give their
 // value when it is 1 or more ("-" in the digits negates; characters after
-// the digits are ignored). Output is never longer than the input.
-code_points decode_html(code_point_view text);
-
-namespace detail {
-// The encoder with a row-by-row table scan for every character, as the
-// reference for the indexed version.
-std::string encode_html_scalar(code_point_view text, std::int64_t options);
-// The decoder with a row-by-row scan for each candidate name.
-code_points decode_html_scalar(code_point_view text);
-}  // namespace detail
+// the digits are ignored). Output is never longer than the input; output
+// past limit code points gives an empty result.
+code_points decode_html(code_point_view text, std::uint64_t limit = kMaxResultCodePoints);
 
 }  // namespace zul::encodings

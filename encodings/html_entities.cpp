@@ -60,22 +60,4 @@ std::optional<std::uint32_t> entity_code_point(std::string_view name) {
   return it->code_point;
 }
 
-namespace detail {
-
-std::string_view entity_name_scan(std::uint32_t cp, bool from_nbsp) {
-  for (const entity& row : kEntities) {
-    if (from_nbsp && row.code_point < kNbsp) continue;
-    if (row.code_point == cp) return row.name;
-  }
-  return {};
-}
-
-std::optional<std::uint32_t> entity_code_point_scan(std::string_view name) {
-  for (const entity& row : kEntities) {
-    if (row.name == name) return row.code_point;
-  }
-  return std::nullopt;
-}
-
-}  // namespace detail
 }  // namespace zul::encodings

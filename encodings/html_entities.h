@@ -2,7 +2,7 @@
 // in both directions: code point to name for the encoders, name to code
 // point for the decoder. Indexed look-ups (binary searches over the table
 // and over a copy sorted by name) give exactly what a row-by-row scan of
-// the table gives; the scans are kept as the reference.
+// the table gives (tests/reference/html_reference.h).
 #pragma once
 
 #include <cstdint>
@@ -19,11 +19,5 @@ std::string_view entity_name(std::uint32_t cp, bool from_nbsp = false);
 // The code point of the row whose name equals name exactly (case-sensitive,
 // same length), or nothing.
 std::optional<std::uint32_t> entity_code_point(std::string_view name);
-
-namespace detail {
-// Row-by-row scans of the table in its order.
-std::string_view entity_name_scan(std::uint32_t cp, bool from_nbsp);
-std::optional<std::uint32_t> entity_code_point_scan(std::string_view name);
-}  // namespace detail
 
 }  // namespace zul::encodings

@@ -1,10 +1,11 @@
-// Mail subject encoding: one pass with output reserved once (2 bytes per
-// input byte + 20, enough for mostly-ASCII subjects). Control bytes are
-// encoded too, since RFC 2047 allows no tab or control byte unencoded
-// inside an encoded word.
+// Mail subject encoding: one pass with output reserved once for the worst
+// case (3 bytes per input byte + 12), capped at the result limit, where
+// encoding stops. Control bytes are encoded too, since RFC 2047 allows no
+// tab or control byte unencoded inside an encoded word.
 #include "encodings/mail_subject.h"
 
-#include "encodings/hex_digits.h"
+#include "common/hex_digits.h"
+#include "common/size_gate.h"
 
 namespace zul::encodings {
 
@@ -16,11 +17,13 @@ bool subject_needs_encoding(std::string_view utf8) {
   return false;
 }
 
-std::string encode_mail_subject(std::string_view utf8) {
+std::string encode_mail_subject(std::string_view utf8, std::uint64_t limit) {
   std::string out;
-  out.reserve(2 * utf8.size() + 20);
+  out.reserve(worst_case_reserve(utf8.size(), 3, 12, limit));
+  if (!make_room(out, 10, limit)) return {};
   out += "=?utf-8?Q?";
   for (const char c : utf8) {
+    if (!make_room(out, 3, limit)) return {};
     const auto b = static_cast<std::uint8_t>(c);
     if (b == ' ') {
       out += '_';
@@ -32,6 +35,7 @@ std::string encode_mail_subject(std::string_view utf8) {
       out += c;
     }
   }
+  if (!make_room(out, 2, limit)) return {};
   out += "?=";
   return out;
 }

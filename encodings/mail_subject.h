@@ -6,6 +6,8 @@
 #include <string>
 #include <string_view>
 
+#include "common/size_gate.h"
+
 namespace zul::encodings {
 
 // True when some byte of the UTF-8 subject is below 32 or above 127 (the
@@ -14,7 +16,8 @@ bool subject_needs_encoding(std::string_view utf8);
 
 // The encoded word for a UTF-8 subject: space becomes "_"; "=", "?", "_",
 // bytes 0..31, 127 and 128..255 become "=" and two upper-case hex digits;
-// other bytes are kept. Size is at most 3 * size + 12 bytes.
-std::string encode_mail_subject(std::string_view utf8);
+// other bytes are kept. Size is at most 3 * size + 12 bytes; a word that
+// would pass limit bytes gives "" (encoding stops there).
+std::string encode_mail_subject(std::string_view utf8, std::uint64_t limit = kMaxResultBytes);
 
 }  // namespace zul::encodings

@@ -1,12 +1,13 @@
 // Quoted-printable: a byte-class table drives the encoder (one look-up per
-// byte); output is reserved once for input length + 1 KiB and grows only
-// for inputs dense in encoded bytes. The decoder copies runs without "=",
-// CR or LF whole.
+// byte); output is reserved once for the worst case, capped at the result
+// limit, where encoding stops. The decoder copies runs without
+// "=", CR or LF whole.
 #include "encodings/quoted_printable.h"
 
 #include <array>
 
-#include "encodings/hex_digits.h"
+#include "common/hex_digits.h"
+#include "common/size_gate.h"
 
 namespace zul::encodings {
 namespace {
@@ -35,12 +36,19 @@ constexpr std::string_view kLineBreak = "\r\n";
 // and the space or tab held back until we know whether a line break follows.
 class encoder {
  public:
-  encoder(std::size_t input_size, std::int64_t line_length) : line_length_(line_length) {
-    out_.reserve(input_size + 1024);
+  encoder(std::size_t input_size, std::int64_t line_length, std::uint64_t limit)
+      : line_length_(line_length), limit_(limit) {
+    // Every input byte writes at most 6 bytes (a soft break and "=XX").
+    out_.reserve(worst_case_reserve(input_size, 6, 16, limit));
   }
 
+  // True once some output was refused because it would pass the limit.
+  bool over() const { return over_; }
+
   void emit_literally(char c) {
-    if (column_ + 1 >= line_length_ - 1) {
+    const bool wraps = column_ + 1 >= line_length_ - 1;
+    if (!room(wraps ? 4 : 1)) return;
+    if (wraps) {
       soft_break();
       column_ = 1;
     } else {
@@ -50,8 +58,10 @@ class encoder {
   }
 
   void emit_hex_encoded(char c) {
+    const bool wraps = column_ + 3 >= line_length_ - 1;
+    if (!room(wraps ? 6 : 3)) return;
     const auto b = static_cast<std::uint8_t>(c);
-    if (column_ + 3 >= line_length_ - 1) {
+    if (wraps) {
       soft_break();
       column_ = 3;
     } else {
@@ -63,6 +73,7 @@ class encoder {
   }
 
   void output_line_break() {
+    if (!room(kLineBreak.size())) return;
     out_ += kLineBreak;
     column_ = 0;
   }
@@ -82,14 +93,21 @@ class encoder {
 
   std::string finish(bool had_line_break) {
     flush_pending(false);
-    if (had_line_break && column_ > 0) {
+    if (had_line_break && column_ > 0 && room(3)) {
       soft_break();
       column_ = 0;
     }
+    if (over_) return {};
     return std::move(out_);
   }
 
  private:
+  // Room for n more bytes within the limit; once refused, always refused.
+  bool room(std::size_t n) {
+    if (!over_ && !make_room(out_, n, limit_)) over_ = true;
+    return !over_;
+  }
+
   void soft_break() {
     out_ += '=';
     out_ += kLineBreak;
@@ -97,6 +115,8 @@ class encoder {
 
   std::string out_;
   std::int64_t line_length_;
+  std::uint64_t limit_;
+  bool over_ = false;
   std::int64_t column_ = 0;
   char pending_ = 0;
 };
@@ -108,13 +128,14 @@ char partner(char c) { return c == '\r' ? '\n' : '\r'; }
 
 }  // namespace
 
-std::string encode_quoted_printable(std::string_view in, std::int64_t line_length) {
+std::string encode_quoted_printable(std::string_view in, std::int64_t line_length,
+                                    std::uint64_t limit) {
   std::int64_t width = static_cast<std::int32_t>(static_cast<std::uint32_t>(line_length));
   if (width <= 1) width = 72;
-  encoder enc(in.size(), width);
+  encoder enc(in.size(), width, limit);
   bool had_line_break = false;
   const std::size_t n = in.size();
-  for (std::size_t i = 0; i < n; ++i) {
+  for (std::size_t i = 0; i < n && !enc.over(); ++i) {
     const char c = in[i];
     switch (kClasses[static_cast<std::uint8_t>(c)]) {
       case byte_class::hex:

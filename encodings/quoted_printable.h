@@ -10,12 +10,16 @@
 #include <string>
 #include <string_view>
 
+#include "common/size_gate.h"
+
 namespace zul::encodings {
 
 // Encodes in. line_length: the low 32 bits as a signed value; 1 or less
 // selects 72. Output of a multi-line input whose last line is not empty
-// ends with a soft break. Empty input gives empty output.
-std::string encode_quoted_printable(std::string_view in, std::int64_t line_length);
+// ends with a soft break. Empty input gives empty output; so does output
+// that would pass limit bytes (encoding stops there).
+std::string encode_quoted_printable(std::string_view in, std::int64_t line_length,
+                                    std::uint64_t limit = kMaxResultBytes);
 
 // Decodes "=hh" pairs (either case; a pair with a non-digit, or cut off by
 // the end, writes nothing), drops soft breaks ("=" before CR/LF, and "="

@@ -8,7 +8,8 @@
 #include <array>
 #include <cstring>
 
-#include "encodings/hex_digits.h"
+#include "common/hex_digits.h"
+#include "common/size_gate.h"
 
 namespace zul::encodings {
 namespace {
@@ -18,8 +19,6 @@ constexpr bool is_unreserved(unsigned b) {
          b == '*' || b == '-' || b == '.' || b == '@' || b == '_';
 }
 
-bool space_as_plus(std::int64_t options) { return (options & 3) == 1; }
-bool escape_plus(std::int64_t options) { return (options & 3) == 1 || (options & 3) == 2; }
 bool plus_as_space(std::int64_t options) { return (options & 1) != 0; }
 
 // One replacement: its length (1 or 3) and up to 4 bytes written at once.
@@ -63,14 +62,33 @@ constexpr std::array<bool, 256> kKeep = [] {
   return keep;
 }();
 
+// The exact encoded size of in, counted only when its worst case passes the
+// limit; 0 (with the output's size unknown) once the count passes it.
+std::uint64_t encoded_size(const escape_table& table, std::string_view in, std::uint64_t limit) {
+  std::uint64_t total = 0;
+  for (const char c : in) {
+    total += table[static_cast<std::uint8_t>(c)].length;
+    if (total > limit) return 0;
+  }
+  return total;
+}
+
 }  // namespace
 
-std::string encode_url(std::string_view in, std::int64_t options) {
+std::string encode_url(std::string_view in, std::int64_t options, std::uint64_t limit) {
   const escape_table& table = table_for(options);
   const auto* p = reinterpret_cast<const std::uint8_t*>(in.data());
   const std::size_t n = in.size();
-  // 3 bytes per input byte, plus slack so each entry can be stored as 4.
-  std::string out(3 * n + 10, '\0');
+  // 3 bytes per input byte. Only when that worst case passes the limit is the
+  // exact size counted first; an output past the limit is never allocated.
+  std::uint64_t room = result_size(limit).add_times(3, n).bytes();
+  if (room == 0 && n != 0) {
+    if (!fits_result(n, limit)) return {};  // every byte gives at least one
+    room = encoded_size(table, in, limit);
+    if (room == 0) return {};
+  }
+  // Slack so each entry can be stored as 4 bytes.
+  std::string out(room + 10, '\0');
   char* o = out.data();
   std::size_t i = 0;
   while (i < n) {
@@ -120,44 +138,4 @@ std::string decode_url(std::string_view in, std::int64_t options) {
   return out;
 }
 
-namespace detail {
-
-std::string encode_url_scalar(std::string_view in, std::int64_t options) {
-  std::string out;
-  out.reserve(3 * in.size() + 10);
-  for (const char c : in) {
-    const auto b = static_cast<std::uint8_t>(c);
-    if (b == ' ' && space_as_plus(options)) {
-      out += '+';
-    } else if (is_unreserved(b) || (b == '+' && !escape_plus(options))) {
-      out += c;
-    } else {
-      out += '%';
-      out += kHexDigits[b / 16];
-      out += kHexDigits[b % 16];
-    }
-  }
-  return out;
-}
-
-std::string decode_url_scalar(std::string_view in, std::int64_t options) {
-  std::string out;
-  out.reserve(in.size());
-  for (std::size_t i = 0; i < in.size();) {
-    if (in[i] == '%') {
-      const unsigned high = i + 1 < in.size() ? hex_value(in[i + 1]) : 0;
-      const unsigned low = i + 2 < in.size() ? hex_value(in[i + 2]) : 0;
-      out += static_cast<char>((high * 16 + low) & 0xFF);
-      i += 3;
-    } else if (plus_as_space(options) && in[i] == '+') {
-      out += ' ';
-      ++i;
-    } else {
-      out += in[i++];
-    }
-  }
-  return out;
-}
-
-}  // namespace detail
 }  // namespace zul::encodings

@@ -9,6 +9,8 @@
 #include <string>
 #include <string_view>
 
+#include "common/size_gate.h"
+
 namespace zul::encodings {
 
 // Options bits (only options & 3 count):
@@ -16,20 +18,15 @@ namespace zul::encodings {
 //   2: space -> "%20", "+" -> "%2B";  3: as 0.
 // The decoder turns "+" into a space when bit 0 is set.
 
-// Percent-encodes every byte of in. Output is at most 3 * size bytes.
-std::string encode_url(std::string_view in, std::int64_t options);
+// Percent-encodes every byte of in. Output is at most 3 * size bytes; an
+// output longer than limit bytes gives "" without being allocated.
+std::string encode_url(std::string_view in, std::int64_t options,
+                       std::uint64_t limit = kMaxResultBytes);
 
 // Decodes "%hh" sequences. Never rejects input: a non-hex digit counts as 0,
 // the two bytes after "%" are always consumed, and a "%" within the last two
 // bytes reads missing digits as 0 (nothing past the end is read). Output is
 // at most in.size() bytes.
 std::string decode_url(std::string_view in, std::int64_t options);
-
-namespace detail {
-// Byte-at-a-time versions that follow the rules directly; the table-driven
-// versions above must give the same output.
-std::string encode_url_scalar(std::string_view in, std::int64_t options);
-std::string decode_url_scalar(std::string_view in, std::int64_t options);
-}  // namespace detail
 
 }  // namespace zul::encodings

@@ -1,26 +1,33 @@
-// XML escaping: one pass, output reserved once (one code point per input
-// character + 4 Ki); the five markup characters are the only ones XML 1.0
-// text needs escaped. The readiness test is one table look-up per byte.
+// XML escaping: one pass, output reserved once for the worst case (6 code
+// points per character), capped at the result limit; the five markup
+// characters are the only ones XML 1.0 text needs escaped. The readiness
+// test is one byte-set search (vector kernels) for the first byte that is
+// not allowed.
 #include "encodings/xml.h"
 
-#include <array>
+#include "common/byte_set.h"
+#include "common/markup.h"
+#include "common/size_gate.h"
 
 namespace zul::encodings {
 namespace {
 
-constexpr bool is_markup(std::uint32_t c) {
-  return c == '"' || c == '&' || c == '\'' || c == '<' || c == '>';
-}
-
-void append(code_points& out, std::string_view ascii) {
+// Appends the reference's characters; false, writing nothing, when the
+// output would pass limit code points.
+bool append(code_points& out, std::string_view ascii, std::uint64_t limit) {
+  if (!make_room(out, ascii.size(), limit)) return false;
   out.insert(out.end(), ascii.begin(), ascii.end());
+  return true;
 }
 
-// Bytes a ready string may hold: 1..127 except the five markup bytes.
-constexpr std::array<bool, 256> kReadyByte = [] {
-  std::array<bool, 256> ready{};
-  for (std::uint32_t b = 1; b < 128; ++b) ready[b] = !is_markup(b);
-  return ready;
+// Bytes a ready string may not hold: 0, 128 and above, the five markup
+// bytes. The check is one byte-set search for the first of them.
+constexpr simd::byte_set kNotReady = [] {
+  simd::byte_set not_ready;
+  for (std::uint32_t b = 0; b < 256; ++b) {
+    if (b == 0 || b >= 128 || is_markup(b)) not_ready.add(static_cast<std::uint8_t>(b));
+  }
+  return not_ready;
 }();
 
 }  // namespace
@@ -32,40 +39,42 @@ bool xml_needs_escaping(code_point_view text) {
   return false;
 }
 
-code_points encode_xml(code_point_view text, std::int64_t options) {
-  if (!text.empty() && (text[0] == 0xFEFF || text[0] == 0xFFFE)) text = text.subspan(1);
+code_points encode_xml(code_point_view text, std::int64_t options, std::uint64_t limit) {
+  text = skip_byte_order_mark(text);
   const bool named_apostrophe = (options & 1) != 0;
   code_points out;
-  out.reserve(text.size() + 4096);
+  out.reserve(worst_case_reserve(text.size(), 6, 0, limit));
   for (const std::uint32_t c : text) {
+    bool fits = true;
     switch (c) {
       case '"':
-        append(out, "&quot;");
+        fits = append(out, "&quot;", limit);
         break;
       case '&':
-        append(out, "&amp;");
+        fits = append(out, "&amp;", limit);
         break;
       case '\'':
-        append(out, named_apostrophe ? "&apos;" : "&#39;");
+        fits = append(out, named_apostrophe ? "&apos;" : "&#39;", limit);
         break;
       case '<':
-        append(out, "&lt;");
+        fits = append(out, "&lt;", limit);
         break;
       case '>':
-        append(out, "&gt;");
+        fits = append(out, "&gt;", limit);
         break;
       default:
-        if (c >= 32 || c == 9 || c == 10 || c == 13) out.push_back(c);
+        if (!is_dropped_control(c)) {
+          fits = make_room(out, 1, limit);
+          if (fits) out.push_back(c);
+        }
     }
+    if (!fits) return {};
   }
   return out;
 }
 
 bool is_markup_free_ascii(std::string_view bytes) {
-  for (const char b : bytes) {
-    if (!kReadyByte[static_cast<std::uint8_t>(b)]) return false;
-  }
-  return true;
+  return simd::find_first_in_set(kNotReady, bytes_of(bytes)) == bytes.size();
 }
 
 }  // namespace zul::encodings

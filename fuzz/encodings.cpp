@@ -18,6 +18,8 @@
 #include "encodings/url.h"
 #include "encodings/yenc.h"
 #include "fuzz/fuzz_check.h"
+#include "tests/reference/html_reference.h"
+#include "tests/reference/url_reference.h"
 #include "tests/reference/yenc_reference.h"
 
 using zul_fuzz::check;
@@ -30,16 +32,27 @@ extern "C" int LLVMFuzzerTestOneInput(const std::uint8_t* data, std::size_t size
   const std::int64_t options = pick >> 4;
   switch (pick % 6) {
     case 0:
-      check(enc::encode_url(in, options) == enc::detail::encode_url_scalar(in, options));
+      check(enc::encode_url(in, options) == zul::reference::encode_url_reference(in, options));
       if ((options & 3) < 3) check(enc::decode_url(enc::encode_url(in, options), options) == in);
       break;
     case 1:
-      check(enc::decode_url(in, options) == enc::detail::decode_url_scalar(in, options));
+      check(enc::decode_url(in, options) == zul::reference::decode_url_reference(in, options));
       break;
     case 2: {
-      const std::vector<std::uint32_t> text(in.begin(), in.end());
-      check(enc::encode_html(text, options) == enc::detail::encode_html_scalar(text, options));
-      check(enc::decode_html(text) == enc::detail::decode_html_scalar(text));
+      // One code point per input byte (U+0000..U+00FF, read unsigned), or
+      // with options bit 1 one per three bytes, anywhere up to U+10FFFF.
+      std::vector<std::uint32_t> text;
+      const std::uint8_t* p = data + 1;
+      if (options & 2) {
+        for (std::size_t k = 0; k + 3 <= in.size(); k += 3) {
+          text.push_back((p[k] << 16 | p[k + 1] << 8 | p[k + 2]) % 0x110000);
+        }
+      } else {
+        text.assign(p, p + in.size());
+      }
+      check(enc::encode_html(text, options) ==
+            zul::reference::encode_html_reference(text, options));
+      check(enc::decode_html(text) == zul::reference::decode_html_reference(text));
       break;
     }
     case 3:

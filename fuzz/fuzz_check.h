@@ -7,6 +7,8 @@
 #include <span>
 #include <string_view>
 
+#include "common/bytes.h"
+
 namespace zul_fuzz {
 
 inline void check(bool ok) {
@@ -14,8 +16,6 @@ inline void check(bool ok) {
 }
 
 // The bytes of a string, for the workers that take byte spans.
-inline std::span<const std::uint8_t> bytes_of(std::string_view s) {
-  return {reinterpret_cast<const std::uint8_t*>(s.data()), s.size()};
-}
+using zul::bytes_of;
 
 }  // namespace zul_fuzz

@@ -10,6 +10,7 @@
 
 #include "fuzz/fuzz_check.h"
 #include "search/byte_search.h"
+#include "tests/reference/byte_search_reference.h"
 
 using zul_fuzz::check;
 using namespace zul::search;
@@ -32,15 +33,15 @@ extern "C" int LLVMFuzzerTestOneInput(const std::uint8_t* data, std::size_t size
   switch (which) {
     case 0:
       got = find_first_of(target, set);
-      want = detail::find_first_of_scalar(target, set);
+      want = zul::reference::find_first_of_reference(target, set);
       break;
     case 1:
       got = find_in_ranges(target, some);
-      want = detail::find_in_ranges_scalar(target, some);
+      want = zul::reference::find_in_ranges_reference(target, some);
       break;
     default:
       got = find_in_signed_ranges_or_set(target, some, set);
-      want = detail::find_in_signed_ranges_or_set_scalar(target, some, set);
+      want = zul::reference::find_in_signed_ranges_or_set_reference(target, some, set);
       break;
   }
   check(got >= 0 && got <= static_cast<std::int64_t>(target.size()));

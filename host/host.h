@@ -14,6 +14,7 @@
 
 #include <cstdint>
 #include <initializer_list>
+#include <map>
 #include <optional>
 #include <set>
 #include <span>
@@ -26,8 +27,6 @@
 
 namespace zul_host {
 
-using namespace text_encoding;
-
 struct HostConfig {
   std::optional<double> version = 2019.0;              // nullopt: no "REALGetRBVersion"
   bool in_runtime = true;                              // answer of "REALinRuntime"
@@ -35,6 +34,11 @@ struct HostConfig {
   std::set<std::string, std::less<>> null_first;       // null on the first look-up, found later
   std::set<std::string, std::less<>> unknown_classes;  // "PluginNewInstance" answers null
   std::int64_t block_cap = std::int64_t{256} << 20;    // bigger memory blocks cannot be made
+  // LenB answers the mapped length for a string whose bytes are exactly a
+  // key: a string that claims gigabytes while holding a few bytes, for tests
+  // of size limits that must refuse before reading (a read past the real
+  // bytes is what the sanitizers then report).
+  std::map<std::string, std::int64_t, std::less<>> claimed_lengths;
 };
 
 struct RegisteredMethod {
@@ -61,15 +65,15 @@ struct Registration {
 // A host string as tests see it (argument or result).
 struct Str {
   std::string bytes;
-  std::uint32_t encoding = kUTF8;
+  std::uint32_t encoding = text_encoding::kUTF8;
   bool null = false;  // the null string handle
   friend bool operator==(const Str&, const Str&) = default;
 };
-inline Str utf8(std::string_view text) { return {std::string(text), kUTF8, false}; }
+inline Str utf8(std::string_view text) { return {std::string(text), text_encoding::kUTF8, false}; }
 inline Str tagged(std::string_view bytes, std::uint32_t encoding) {
   return {std::string(bytes), encoding, false};
 }
-inline Str null_string() { return {{}, kUTF8, true}; }
+inline Str null_string() { return {{}, text_encoding::kUTF8, true}; }
 
 // A memory block as tests see it.
 struct Block {

@@ -14,11 +14,15 @@
 #include "host/text_convert.h"
 
 namespace zul_host {
+
+using namespace text_encoding;
+
 namespace {
 
 constexpr std::string_view kUsage =
     "usage: zul [--plugin PATH] [--host-version V|none] [--verbose] list\n"
     "       zul [--plugin PATH] [--host-version V|none] [--verbose] call NAME ARG...\n"
+    "options may stand anywhere; after a lone -- every word is an argument\n"
     "string, memoryblock and ptr arguments: TEXT, hex:C3A9, file:PATH, @null,\n"
     "  or utf8: utf16: utf32: latin1: cp1252: macroman: ascii: followed by TEXT\n";
 
@@ -232,80 +236,84 @@ std::string format_value(const DynamicValue& value, bool* as_hex) {
   return "";
 }
 
-int run_zul(const std::vector<std::string>& args, const std::string& default_plugin,
-            std::ostream& out, std::ostream& err) {
-  std::string plugin = default_plugin;
+namespace {
+
+// What the command line asks for once its options are read.
+struct CommandLine {
+  std::string plugin;
   HostConfig config;
   bool verbose = false;
-  std::size_t i = 0;
-  for (; i < args.size() && starts_with(args[i], "--"); ++i) {
-    const std::string& option = args[i];
-    if (option == "--verbose") {
-      verbose = true;
-    } else if (option == "--plugin" && i + 1 < args.size()) {
-      plugin = args[++i];
-    } else if (option == "--host-version" && i + 1 < args.size()) {
-      const std::string& v = args[++i];
-      if (v == "none") {
-        config.version.reset();
-      } else if (auto parsed = parse_argument(ValueType::double_, v)) {
-        config.version = parsed->real;
-      } else {
-        err << "zul: --host-version wants a number or none, not '" << v << "'\n" << kUsage;
-        return 2;
-      }
+  std::vector<std::string> words;  // the sub-command, then its arguments
+};
+
+// Reads the option at args[i] (advancing i past its value); false after
+// reporting an unknown or incomplete one.
+bool read_option(const std::vector<std::string>& args, std::size_t& i, CommandLine& line,
+                 std::ostream& err) {
+  const std::string& option = args[i];
+  const bool has_value = i + 1 < args.size();
+  if (option == "--verbose") {
+    line.verbose = true;
+  } else if (option == "--plugin" && has_value) {
+    line.plugin = args[++i];
+  } else if (option == "--host-version" && has_value) {
+    const std::string& v = args[++i];
+    if (v == "none") {
+      line.config.version.reset();
+    } else if (auto parsed = parse_argument(ValueType::double_, v)) {
+      line.config.version = parsed->real;
     } else {
-      err << "zul: unknown or incomplete option '" << option << "'\n" << kUsage;
-      return 2;
+      err << "zul: --host-version wants a number or none, not '" << v << "'\n" << kUsage;
+      return false;
+    }
+  } else {
+    err << "zul: unknown or incomplete option '" << option << "'\n" << kUsage;
+    return false;
+  }
+  return true;
+}
+
+// Options may stand anywhere, before or after the sub-command and between
+// its arguments, as users type them; a lone "--" ends them, so that later
+// words starting with "--" are arguments.
+bool read_command_line(const std::vector<std::string>& args, CommandLine& line, std::ostream& err) {
+  bool options_ended = false;
+  for (std::size_t i = 0; i < args.size(); ++i) {
+    if (!options_ended && args[i] == "--") {
+      options_ended = true;
+    } else if (!options_ended && starts_with(args[i], "--")) {
+      if (!read_option(args, i, line, err)) return false;
+    } else {
+      line.words.push_back(args[i]);
     }
   }
-  if (i >= args.size() || (args[i] != "list" && args[i] != "call") ||
-      (args[i] == "call" && i + 1 >= args.size())) {
+  const std::vector<std::string>& w = line.words;
+  if (w.empty() || (w[0] != "list" && w[0] != "call") || (w[0] == "call" && w.size() < 2)) {
     err << kUsage;
-    return 2;
+    return false;
   }
+  return true;
+}
 
-  Host host(config);
-  try {
-    host.load(plugin);
-  } catch (const std::exception& e) {
-    err << "zul: " << e.what() << "\n";
-    return 3;
+void report_no_overload(const Registration& registration, const std::string& name,
+                        std::ostream& err) {
+  std::vector<std::string> candidates;
+  for (const RegisteredMethod& m : registration.methods) {
+    const auto d = parse_declaration(m.declaration);
+    if (d && d->name == name) candidates.push_back(m.declaration);
   }
-  const Registration& registration = host.registration();
-  if (args[i] == "list") {
-    for (const RegisteredMethod& m : registration.methods) out << m.declaration << "\n";
-    return 0;
+  if (candidates.empty()) {
+    err << "zul: no function named " << name << " (see zul list)\n";
+    return;
   }
+  err << "zul: these arguments fit no overload of " << name << ":\n";
+  for (const std::string& c : candidates) err << "  " << c << "\n";
+}
 
-  const std::string& name = args[i + 1];
-  const std::vector<std::string> call_args(args.begin() + static_cast<std::ptrdiff_t>(i) + 2,
-                                           args.end());
-  std::vector<DynamicValue> values;
-  const auto declaration = choose_overload(registration, name, call_args, values);
-  if (!declaration) {
-    std::vector<std::string> candidates;
-    for (const RegisteredMethod& m : registration.methods) {
-      const auto d = parse_declaration(m.declaration);
-      if (d && d->name == name) candidates.push_back(m.declaration);
-    }
-    if (candidates.empty()) {
-      err << "zul: no function named " << name << " (see zul list)\n";
-    } else {
-      err << "zul: these arguments fit no overload of " << name << ":\n";
-      for (const std::string& c : candidates) err << "  " << c << "\n";
-    }
-    return 2;
-  }
-
-  DynamicValue result;
-  try {
-    result = call_dynamic(host, *declaration, values);
-  } catch (const std::exception& e) {
-    err << "zul: " << e.what() << "\n";
-    return 2;
-  }
-  if (verbose) err << "zul: called " << *declaration << "\n";
+// Prints the result (and, when asked or when it is hex, what it is) and
+// checks the ledger. Returns the exit status.
+int report_result(const Host& host, const DynamicValue& result, bool verbose, std::ostream& out,
+                  std::ostream& err) {
   if (const auto& raised = host.last_exception()) {
     err << raised->class_name << ": " << raised->message << "\n";
     return 1;
@@ -324,6 +332,48 @@ int run_zul(const std::vector<std::string>& args, const std::string& default_plu
     return 3;
   }
   return 0;
+}
+
+int call_by_name(Host& host, const std::string& name, const std::vector<std::string>& args,
+                 bool verbose, std::ostream& out, std::ostream& err) {
+  std::vector<DynamicValue> values;
+  const auto declaration = choose_overload(host.registration(), name, args, values);
+  if (!declaration) {
+    report_no_overload(host.registration(), name, err);
+    return 2;
+  }
+  DynamicValue result;
+  try {
+    result = call_dynamic(host, *declaration, values);
+  } catch (const std::exception& e) {
+    err << "zul: " << e.what() << "\n";
+    return 2;
+  }
+  if (verbose) err << "zul: called " << *declaration << "\n";
+  return report_result(host, result, verbose, out, err);
+}
+
+}  // namespace
+
+int run_zul(const std::vector<std::string>& args, const std::string& default_plugin,
+            std::ostream& out, std::ostream& err) {
+  CommandLine line;
+  line.plugin = default_plugin;
+  if (!read_command_line(args, line, err)) return 2;
+
+  Host host(line.config);
+  try {
+    host.load(line.plugin);
+  } catch (const std::exception& e) {
+    err << "zul: " << e.what() << "\n";
+    return 3;
+  }
+  if (line.words[0] == "list") {
+    for (const RegisteredMethod& m : host.registration().methods) out << m.declaration << "\n";
+    return 0;
+  }
+  const std::vector<std::string> call_args(line.words.begin() + 2, line.words.end());
+  return call_by_name(host, line.words[1], call_args, line.verbose, out, err);
 }
 
 }  // namespace zul_host

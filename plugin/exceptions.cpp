@@ -29,11 +29,14 @@ void RaiseException(const char* class_name, const char* message, std::uint32_t e
   if (text) REALUnlockString(text);
 }
 
-TrappedError map_exception(std::exception_ptr error) noexcept {
+TrappedError map_current_exception() noexcept {
+  // Rethrowing the exception being handled allocates nothing (unlike
+  // rethrowing an exception_ptr), and every message is static text or the
+  // exception's own what() text, so the mapping works with no memory left.
   constexpr const char* kOutOfBounds = "OutOfBoundsException";
   constexpr const char* kRuntime = "RuntimeException";
   try {
-    std::rethrow_exception(error);
+    throw;
   } catch (const std::bad_alloc&) {
     return {"OutOfMemoryException", "Failed to allocate memory."};
   } catch (const std::range_error& e) {
@@ -58,11 +61,11 @@ TrappedError map_exception(std::exception_ptr error) noexcept {
 }
 
 void raise_current_exception() noexcept {
+  const TrappedError mapped = map_current_exception();
   try {
-    TrappedError mapped = map_exception(std::current_exception());
-    RaiseException(mapped.class_name, mapped.message.c_str(), 0);
+    RaiseException(mapped.class_name, mapped.message, 0);
   } catch (...) {
-    // Building the message itself ran out of memory: nothing more can be
-    // reported, and nothing may reach the host.
+    // The wrappers call the host's C services and throw nothing themselves;
+    // this only keeps a failure inside them from reaching the host.
   }
 }

@@ -46,18 +46,10 @@ Once ubound_cache("RuntimeUBound");
 Retry insert_proc_cache("PluginStringArrayInsertProc");
 
 // LenB is a host-language method, found through "REALLoadGlobalMethod" once.
-struct LenBCache {
-  std::atomic<void*> fn{nullptr};
-  std::atomic<bool> resolved{false};
-} lenb_cache;
+Once lenb_cache("LenB( s as string ) as integer");
 
 host_sig::LenB lenb() {
-  if (!lenb_cache.resolved.load(std::memory_order_acquire)) {
-    lenb_cache.fn.store(REALLoadFrameworkMethod("LenB( s as string ) as integer"),
-                        std::memory_order_relaxed);
-    lenb_cache.resolved.store(true, std::memory_order_release);
-  }
-  return reinterpret_cast<host_sig::LenB>(lenb_cache.fn.load(std::memory_order_relaxed));
+  return reinterpret_cast<host_sig::LenB>(lenb_cache.get(REALLoadFrameworkMethod));
 }
 
 }  // namespace

@@ -33,16 +33,23 @@ class HostEntryCache {
 
   // The service pointer, or null when the host has none (now, for retry).
   void* get() {
+    return get([](const char* name) { return gResolver ? gResolver(name) : nullptr; });
+  }
+
+  // The same for a pointer that is not a resolver service (a host-language
+  // method): resolve(name) finds it when the cache has no answer yet.
+  template <class Resolve>
+  void* get(Resolve&& resolve) {
     if constexpr (Kind == CacheKind::once) {
       if (resolved_.load(std::memory_order_acquire)) return fn_.load(std::memory_order_relaxed);
-      void* fn = gResolver ? gResolver(name_) : nullptr;
+      void* fn = resolve(name_);
       fn_.store(fn, std::memory_order_relaxed);
       resolved_.store(true, std::memory_order_release);
       return fn;
     } else {
       void* fn = fn_.load(std::memory_order_acquire);
       if (fn) return fn;
-      fn = gResolver ? gResolver(name_) : nullptr;
+      fn = resolve(name_);
       if (fn) fn_.store(fn, std::memory_order_release);
       return fn;
     }

@@ -9,8 +9,10 @@
 
 namespace {
 
-template <class Fn>
-GlobalMethodEntry row(Fn* function, const char* declaration) {
+// Takes only noexcept functions: a native that could let an exception out
+// into the host does not compile into the table.
+template <class R, class... Args>
+GlobalMethodEntry row(R (*function)(Args...) noexcept, const char* declaration) {
   return {reinterpret_cast<void*>(function), nullptr, declaration, 4, 0, 0, nullptr};
 }
 

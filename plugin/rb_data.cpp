@@ -3,14 +3,13 @@
 // destructor; it never owns the bytes.
 #include "plugin/rb_data.h"
 
-#include <atomic>
-
 #include "plugin/host_services.h"
 
 namespace {
 
-// "Operator_Convert() As Ptr" of the host's MemoryBlock class, found once.
-std::atomic<void*> myMemoryBlockGetPtr{nullptr};
+// "Operator_Convert() As Ptr" of the host's MemoryBlock class, asked for
+// until it is found, then kept.
+HostEntryCache<CacheKind::retry> myMemoryBlockGetPtr("Operator_Convert() As Ptr");
 
 void* call_get_ptr(void* method, REALmemoryBlock block) {
   return reinterpret_cast<host_sig::MemoryBlockToPtr>(method)(reinterpret_cast<REALobject>(block));
@@ -55,16 +54,15 @@ std::int64_t memory_block_size(REALmemoryBlock block) {
 
 void* MyREALMemoryBlockGetPtr(REALmemoryBlock block) {
   if (!block) return nullptr;
-  if (void* method = myMemoryBlockGetPtr.load(std::memory_order_acquire)) {
-    return call_get_ptr(method, block);
-  }
-  // Find the conversion method on a small probe block (or on the block
-  // itself when no probe can be made) and keep it for the process.
-  REALmemoryBlock probe = REALNewMemoryBlockOriginal(4);
-  REALobject target = reinterpret_cast<REALobject>(probe ? probe : block);
-  void* method = REALLoadObjectMethod(target, "Operator_Convert() As Ptr");
-  if (method) myMemoryBlockGetPtr.store(method, std::memory_order_release);
-  if (probe) REALUnlockObject(reinterpret_cast<REALobject>(probe));
+  // The conversion method is found on a small probe block (or on the block
+  // itself when no probe can be made).
+  void* method = myMemoryBlockGetPtr.get([&](const char* declaration) {
+    REALmemoryBlock probe = REALNewMemoryBlockOriginal(4);
+    REALobject target = reinterpret_cast<REALobject>(probe ? probe : block);
+    void* found = REALLoadObjectMethod(target, declaration);
+    if (probe) REALUnlockObject(reinterpret_cast<REALobject>(probe));
+    return found;
+  });
   if (method) return call_get_ptr(method, block);
   return REALMemoryBlockGetPtr(block);
 }

@@ -6,9 +6,11 @@
 // gives the 16- and 32-bit forms their natural alignment.)
 #include "plugin/rb_text.h"
 
+#include <cstdint>
 #include <cstdlib>
 #include <cstring>
 
+#include "common/bytes.h"
 #include "plugin/host_services.h"
 #include "plugin/rb_data.h"
 #include "plugin/results.h"
@@ -20,13 +22,6 @@ const std::uint16_t EmptyBufferUInt16[4] = {};
 const std::uint32_t EmptyBufferUInt32[4] = {};
 
 constexpr const void* kEmpty[] = {EmptyBuffer, EmptyBuffer, EmptyBufferUInt16, EmptyBufferUInt32};
-
-bool all_ascii(const rbData& bytes) {
-  for (std::uint8_t b : bytes.bytes()) {
-    if (b >= 0x80) return false;
-  }
-  return true;
-}
 
 // Encodings whose bytes below 0x80 are ASCII characters.
 bool ascii_compatible(std::uint32_t e) {
@@ -53,10 +48,10 @@ rbText::rbText(REALstring s) {
   const std::uint32_t encoding = REALGetStringEncoding(s, &available);
   if (!available || ascii_compatible(encoding)) {
     rbData bytes(s);
-    if (all_ascii(bytes)) apply_ascii_shortcut();
+    if (zul::all_ascii(bytes.bytes())) apply_ascii_shortcut();
   } else if (encoding == text_encoding::kUnknown) {
     rbData bytes(s);
-    if (all_ascii(bytes)) {
+    if (zul::all_ascii(bytes.bytes())) {
       apply_ascii_shortcut();
     } else {
       // Bytes without a declared encoding are read as Mac OS Roman: the view
@@ -101,15 +96,36 @@ void rbText::reset_slot(Slot slot) {
 }
 
 bool rbText::take_copy(Slot slot, const void* src, std::size_t units, std::size_t unit) {
-  // Zero-filled with room for a terminating zero unit (and then some).
-  void* buffer = std::calloc(units * unit + 4 * unit, 1);
   reset_slot(slot);
+  // units comes from a length the host reports: a count whose buffer (with
+  // four spare units) has no size, or that a signed length cannot hold, is
+  // a failed allocation.
+  if (units > SIZE_MAX / unit - 4 || units > static_cast<std::uint64_t>(INT64_MAX)) return false;
+  // Zero-filled with room for a terminating zero unit (and then some).
+  void* buffer = std::calloc(units + 4, unit);
   if (!buffer) return false;
   if (units) std::memcpy(buffer, src, units * unit);
   owned_[slot] = buffer;
   pointers_[slot] = buffer;
   lengths_[slot] = static_cast<std::int64_t>(units);
   return true;
+}
+
+template <class Unit>
+void rbText::widen_ascii(Slot slot) {
+  const std::int64_t n = LengthASCII();
+  if (n < 1) return;
+  // Room for a terminating zero unit and then some; calloc checks the
+  // product of count and unit size.
+  const auto count = static_cast<std::uint64_t>(n);
+  if (count > SIZE_MAX - 4) return;
+  auto* wide = static_cast<Unit*>(std::calloc(static_cast<std::size_t>(count) + 4, sizeof(Unit)));
+  if (!wide) return;
+  const auto* bytes = static_cast<const std::uint8_t*>(pointers_[kASCII]);
+  for (std::int64_t i = 0; i < n; ++i) wide[i] = bytes[i];
+  owned_[slot] = wide;
+  pointers_[slot] = wide;
+  lengths_[slot] = n;
 }
 
 bool rbText::fetch(Slot slot, std::uint32_t encoding, std::size_t unit) {
@@ -154,15 +170,7 @@ void rbText::ConvertUTF16() {
   reset_slot(kUTF16);
   if (!string_) return;
   if (is_ascii_) {
-    const std::int64_t n = LengthASCII();
-    if (n < 1) return;
-    auto* wide = static_cast<std::uint16_t*>(std::calloc(static_cast<std::size_t>(n) + 2, 2));
-    if (!wide) return;
-    const auto* bytes = static_cast<const std::uint8_t*>(pointers_[kASCII]);
-    for (std::int64_t i = 0; i < n; ++i) wide[i] = bytes[i];
-    owned_[kUTF16] = wide;
-    pointers_[kUTF16] = wide;
-    lengths_[kUTF16] = n;
+    widen_ascii<std::uint16_t>(kUTF16);
     return;
   }
   if (!fetch(kUTF16, text_encoding::kUTF16, 2)) return;
@@ -181,15 +189,7 @@ void rbText::ConvertUTF32() {
   reset_slot(kUTF32);
   if (!string_) return;
   if (is_ascii_) {
-    const std::int64_t n = LengthASCII();
-    if (n < 1) return;
-    auto* wide = static_cast<std::uint32_t*>(std::calloc(static_cast<std::size_t>(n) + 1, 4));
-    if (!wide) return;
-    const auto* bytes = static_cast<const std::uint8_t*>(pointers_[kASCII]);
-    for (std::int64_t i = 0; i < n; ++i) wide[i] = bytes[i];
-    owned_[kUTF32] = wide;
-    pointers_[kUTF32] = wide;
-    lengths_[kUTF32] = n;
+    widen_ascii<std::uint32_t>(kUTF32);
     return;
   }
   // A host that failed an earlier conversion is not trusted with UTF-32
@@ -214,6 +214,7 @@ void rbText::derive_utf32_from_utf16() {
   reset_slot(kUTF32);
   const std::int64_t n = lengths_[kUTF16];
   if (n < 1) return;
+  // n is at most the UTF-16 slot's unit count, which take_copy bounded.
   auto* out = static_cast<std::uint32_t*>(std::calloc(static_cast<std::size_t>(n) + 4, 4));
   if (!out) return;
   const auto* in = static_cast<const std::uint16_t*>(pointers_[kUTF16]);

@@ -44,7 +44,6 @@ class rbText {
   }
 
   bool is_ascii() const { return is_ascii_; }
-  bool host_failed() const { return host_failed_; }
 
  private:
   enum Slot { kASCII = 0, kUTF8 = 1, kUTF16 = 2, kUTF32 = 3, kSlots = 4 };
@@ -58,6 +57,10 @@ class rbText {
   bool fetch(Slot slot, std::uint32_t encoding, std::size_t unit);
   bool take_copy(Slot slot, const void* src, std::size_t units, std::size_t unit);
   void reset_slot(Slot slot);
+  // Widens the ASCII slot's bytes to units of Unit in the slot (empty when
+  // there are none or no buffer can be had).
+  template <class Unit>
+  void widen_ascii(Slot slot);
   void apply_ascii_shortcut();
   void derive_utf32_from_utf16();
 

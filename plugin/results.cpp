@@ -4,12 +4,12 @@
 // UTF-32. Every intermediate host value is released exactly once here.
 #include "plugin/results.h"
 
-#include <atomic>
 #include <cstdio>
 #include <cstdlib>
 #include <cstring>
 #include <new>
 
+#include "common/bytes.h"
 #include "plugin/exceptions.h"
 #include "plugin/host_services.h"
 #include "plugin/rb_data.h"
@@ -18,13 +18,6 @@ namespace {
 
 constexpr std::int64_t kMaxStringBytes = 0x7FFFFFFF;
 constexpr std::int64_t kStackConversionBytes = 800;
-
-bool all_ascii(const std::uint8_t* p, std::int64_t n) {
-  for (std::int64_t i = 0; i < n; ++i) {
-    if (p[i] >= 0x80) return false;
-  }
-  return true;
-}
 
 REALstring build_plain(const void* data, std::int64_t length, std::uint32_t encoding) {
   REALstring s = originalREALBuildString(data, static_cast<std::int32_t>(length));
@@ -89,7 +82,8 @@ REALstring REALBuildUnicodeString(const void* data, std::int64_t length, std::ui
       case text_encoding::kMacRoman:
       case text_encoding::kWindowsLatin1:
       case text_encoding::kUnknown:
-        if (all_ascii(bytes, length)) encoding = text_encoding::kASCII;
+        if (zul::all_ascii({bytes, static_cast<std::size_t>(length)}))
+          encoding = text_encoding::kASCII;
         return build_plain(data, length, encoding);
       case text_encoding::kUTF16:
         return REALBuildUnicodeStringUTF16(data, length);
@@ -136,8 +130,7 @@ namespace {
 
 // "Constructor(bytes as Integer)" of the host class "MemoryBlock", found
 // from the first block made this way and kept for the process.
-std::atomic<void*> memory_block_constructor{nullptr};
-std::atomic<bool> memory_block_constructor_resolved{false};
+HostEntryCache<CacheKind::once> memory_block_constructor("Constructor(bytes as Integer)");
 
 REALmemoryBlock make_block(std::int64_t size) {
   if (size < kMaxStringBytes) return REALNewMemoryBlockOriginal(static_cast<std::int32_t>(size));
@@ -154,13 +147,9 @@ void REALNewMemoryBlockWork(void* arg) {
   auto* params = static_cast<NewMemoryBlockParams*>(arg);
   REALobject object = REALnewInstance("MemoryBlock");
   if (!object) return;
-  if (!memory_block_constructor_resolved.load(std::memory_order_acquire)) {
-    memory_block_constructor.store(REALLoadObjectMethod(object, "Constructor(bytes as Integer)"),
-                                   std::memory_order_relaxed);
-    memory_block_constructor_resolved.store(true, std::memory_order_release);
-  }
-  auto constructor = reinterpret_cast<host_sig::MemoryBlockConstructor>(
-      memory_block_constructor.load(std::memory_order_relaxed));
+  auto constructor =
+      reinterpret_cast<host_sig::MemoryBlockConstructor>(memory_block_constructor.get(
+          [&](const char* declaration) { return REALLoadObjectMethod(object, declaration); }));
   if (!constructor) {
     REALUnlockObject(object);
     return;

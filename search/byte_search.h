@@ -7,9 +7,9 @@
 #include <cstdint>
 #include <span>
 
-namespace zul::search {
+#include "common/bytes.h"
 
-using bytes_view = std::span<const std::uint8_t>;
+namespace zul::search {
 
 // An inclusive range of byte values; first > last contains nothing. Bounds
 // are taken as given (no clamping to a byte, no swapping).
@@ -30,15 +30,5 @@ std::int64_t find_in_ranges(bytes_view target, std::span<const byte_range> range
 // one of the ranges, or that equals a byte of set.
 std::int64_t find_in_signed_ranges_or_set(bytes_view target, std::span<const byte_range> ranges,
                                           bytes_view set);
-
-namespace detail {
-// Reference versions: for each target byte, the ranges and then the set
-// bytes are tested in order. The table-driven versions above must agree.
-std::int64_t find_first_of_scalar(bytes_view target, bytes_view set);
-std::int64_t find_in_ranges_scalar(bytes_view target, std::span<const byte_range> ranges);
-std::int64_t find_in_signed_ranges_or_set_scalar(bytes_view target,
-                                                 std::span<const byte_range> ranges,
-                                                 bytes_view set);
-}  // namespace detail
 
 }  // namespace zul::search

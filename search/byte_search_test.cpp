@@ -8,6 +8,8 @@
 #include <string_view>
 #include <vector>
 
+#include "tests/reference/byte_search_reference.h"
+
 namespace zul::search {
 namespace {
 
@@ -33,7 +35,7 @@ TEST(find_first_of, first_target_byte_in_the_set_wins) {
   for (const auto& row : rows) {
     SCOPED_TRACE(row.why);
     EXPECT_EQ(find_first_of(b(row.target), b(row.set)), row.want);
-    EXPECT_EQ(detail::find_first_of_scalar(b(row.target), b(row.set)), row.want);
+    EXPECT_EQ(zul::reference::find_first_of_reference(b(row.target), b(row.set)), row.want);
   }
 }
 
@@ -80,10 +82,11 @@ TEST(byte_search, table_driven_versions_match_the_reference) {
     const auto set = random_bytes(set_len(rng), 0, 255);
     std::vector<byte_range> ranges;
     for (int i = 0, n = 1 + round % 3; i < n; ++i) ranges.push_back({bound(rng), bound(rng)});
-    ASSERT_EQ(find_first_of(target, set), detail::find_first_of_scalar(target, set));
-    ASSERT_EQ(find_in_ranges(target, ranges), detail::find_in_ranges_scalar(target, ranges));
+    ASSERT_EQ(find_first_of(target, set), zul::reference::find_first_of_reference(target, set));
+    ASSERT_EQ(find_in_ranges(target, ranges),
+              zul::reference::find_in_ranges_reference(target, ranges));
     ASSERT_EQ(find_in_signed_ranges_or_set(target, ranges, set),
-              detail::find_in_signed_ranges_or_set_scalar(target, ranges, set));
+              zul::reference::find_in_signed_ranges_or_set_reference(target, ranges, set));
   }
 }
 

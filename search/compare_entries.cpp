@@ -2,7 +2,8 @@
 // comparison read stored bytes through rbData; the character comparison and
 // the distances read text through rbText views, so strings stored in
 // different encodings compare by their characters. Views and holders are
-// released on every path; no exception reaches the host.
+// released on every path. Counting and byte comparison report nothing; the
+// character comparison and the distances raise through the trap.
 #include <cstdio>
 
 #include "plugin/exceptions.h"
@@ -14,10 +15,6 @@
 #include "search/distance.h"
 
 namespace {
-
-zul::search::bytes_view bytes_of(std::string_view text) {
-  return {reinterpret_cast<const std::uint8_t*>(text.data()), text.size()};
-}
 
 // Raises "OutOfMemoryException" for a work buffer of bytes bytes; the count
 // is printed as a 32-bit signed integer (a larger count shows truncated).
@@ -43,20 +40,24 @@ double distance_between(REALstring a, REALstring b, double failed, Distance dist
 
 }  // namespace
 
-int64_t CountOccurancesZUL(REALstring s, REALstring find) {
-  rbData hs(s);
-  rbData hf(find);
-  return zul::search::count_occurrences(hs.bytes(), hf.bytes());
+std::int64_t CountOccurancesZUL(REALstring s, REALstring find) noexcept {
+  return quietly<std::int64_t>(0, [&] {
+    rbData hs(s);
+    rbData hf(find);
+    return zul::search::count_occurrences(hs.bytes(), hf.bytes());
+  });
 }
 
-int64_t StrCompBytesZUL(REALstring a, REALstring b) {
-  rbData ha(a);
-  rbData hb(b);
-  return zul::search::compare_bytes(ha.bytes(), hb.bytes());
+std::int64_t StrCompBytesZUL(REALstring a, REALstring b) noexcept {
+  return quietly<std::int64_t>(0, [&] {
+    rbData ha(a);
+    rbData hb(b);
+    return zul::search::compare_bytes(ha.bytes(), hb.bytes());
+  });
 }
 
-int64_t StrCompCharsZUL(REALstring a, REALstring b) {
-  return trapped<int64_t>(0, [&]() -> int64_t {
+std::int64_t StrCompCharsZUL(REALstring a, REALstring b) noexcept {
+  return trapped<std::int64_t>(0, [&]() -> std::int64_t {
     {
       rbData ha(a);
       rbData hb(b);
@@ -68,14 +69,14 @@ int64_t StrCompCharsZUL(REALstring a, REALstring b) {
     }
     rbText ta(a);
     rbText tb(b);
-    return zul::search::compare_bytes(bytes_of(ta.utf8()), bytes_of(tb.utf8()));
+    return zul::search::compare_bytes(zul::bytes_of(ta.utf8()), zul::bytes_of(tb.utf8()));
   });
 }
 
-double jaroWinklerDistanceZUL(REALstring a, REALstring b) {
+double jaroWinklerDistanceZUL(REALstring a, REALstring b) noexcept {
   return distance_between(a, b, 0.0, zul::search::jaro_winkler_distance);
 }
 
-double levenshteinDistanceZUL(REALstring a, REALstring b) {
+double levenshteinDistanceZUL(REALstring a, REALstring b) noexcept {
   return distance_between(a, b, 1.0, zul::search::levenshtein_distance);
 }

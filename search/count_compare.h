@@ -7,9 +7,9 @@
 #include <cstdint>
 #include <span>
 
-namespace zul::search {
+#include "common/bytes.h"
 
-using bytes_view = std::span<const std::uint8_t>;
+namespace zul::search {
 
 // Number of non-overlapping occurrences of find in s, scanning left to right
 // and resuming after each match ("aa" occurs twice in "aaaa", once in
@@ -21,12 +21,5 @@ std::int64_t count_occurrences(bytes_view s, bytes_view find) noexcept;
 // zero bytes: a proper prefix sorts first unless the rest of the longer
 // string is all zero bytes, in which case the two compare equal.
 int compare_bytes(bytes_view a, bytes_view b) noexcept;
-
-namespace detail {
-// Reference versions: a plain position-by-position scan. The versions above
-// (memchr / memcmp based) must agree with them.
-std::int64_t count_occurrences_scalar(bytes_view s, bytes_view find) noexcept;
-int compare_bytes_scalar(bytes_view a, bytes_view b) noexcept;
-}  // namespace detail
 
 }  // namespace zul::search

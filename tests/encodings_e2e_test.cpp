@@ -202,6 +202,8 @@ TEST_F(Encodings, readiness) {
       {tagged("Hello", kUTF16), false, "UTF-16 encoding"},
       {tagged("Hello", kLatin1), false, "ISO Latin 1 encoding"},
       {utf8(""), true, "empty"},
+      {tagged("", kUTF16), true, "empty UTF-16: nothing to escape, the tag does not matter"},
+      {tagged("", kLatin1), true, "empty ISO Latin 1"},
       {null_string(), true, "null"},
   };
   for (const auto& row : rows) {
@@ -213,6 +215,31 @@ TEST_F(Encodings, readiness) {
 
 TEST_F(Encodings, subject_of_an_empty_string_is_that_string) {
   EXPECT_EQ(call<Str>(kSubject, utf8("")).bytes, "");
+}
+
+// When the host cannot give a subject's UTF-8 form there is nothing a mail
+// header could carry: the result is null, with nothing raised, rather than
+// the stored UTF-16 or UTF-32 bytes.
+TEST_F(Encodings, subject_without_a_utf8_form_is_null) {
+  const struct {
+    Str in;
+    const char* why;
+  } rows[] = {
+      {utf16(u"ab\xD800"), "lone high surrogate in UTF-16"},
+      {utf16(u"\xDC00x"), "lone low surrogate in UTF-16"},
+      {tagged("a\0b"sv, kUTF16), "odd-length UTF-16"},
+      {tagged("\x00\x00\x11\x00"sv, kUTF32), "UTF-32 past U+10FFFF"},
+      {tagged("a\0\0\0b"sv, kUTF32), "UTF-32 of 5 bytes"},
+  };
+  for (const auto& row : rows) {
+    SCOPED_TRACE(row.why);
+    EXPECT_TRUE(same(call<Str>(kSubject, row.in), none()));
+    EXPECT_FALSE(raised());
+  }
+  // The same texts well formed are encoded as usual.
+  EXPECT_TRUE(same(call<Str>(kSubject, utf16(u"ab\x00E9")), ascii("=?utf-8?Q?ab=C3=A9?=")));
+  EXPECT_TRUE(
+      same(call<Str>(kSubject, tagged("\xE9\0\0\0"sv, kUTF32)), ascii("=?utf-8?Q?=C3=A9?=")));
 }
 
 TEST_F(Encodings, yenc_memory_block_matches_the_string_variant) {

@@ -10,6 +10,8 @@
 
 namespace {
 
+using namespace text_encoding;
+
 using namespace zul_host;
 
 TEST(parse_argument, forms_by_type) {
@@ -182,13 +184,28 @@ TEST(run_zul, statuses_and_output) {
        "A\n",
        "",
        "per-method host"},
+      {{"call", "FakeEchoZUL", "hi", "--verbose"}, 0, "hi\n", "called FakeEchoZUL", "option last"},
+      {{"call", "--verbose", "FakeEchoZUL", "hi"}, 0, "hi\n", "called", "option after call"},
+      {{"list", "--host-version", "none"},
+       0,
+       "FakeEchoZUL(s as string) as string\n",
+       "",
+       "option after list"},
+      {{"call", "FakeEchoZUL", "--", "--verbose"}, 0, "--verbose\n", "", "-- ends the options"},
+      {{"call", "FakeEchoZUL", "hi", "--plugin"},
+       2,
+       "",
+       "incomplete option",
+       "option value missing"},
   };
   for (const auto& row : rows) {
     SCOPED_TRACE(row.why);
     const ZulRun run = zul(row.args);
     EXPECT_EQ(run.status, row.want_status) << run.err;
-    if (row.want_status == 0 || row.want_status == 3) {
+    if (row.want_status == 3 || (row.want_status == 0 && row.args[0] != "list")) {
       EXPECT_EQ(run.out, row.want_out);
+    } else if (row.want_status == 0) {
+      EXPECT_EQ(run.out.substr(0, run.out.find('\n') + 1), row.want_out);
     }
     EXPECT_NE(run.err.find(row.want_err_part), std::string::npos) << run.err;
   }

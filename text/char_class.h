@@ -25,9 +25,4 @@ bool all_bytes_in(std::span<const std::uint8_t> bytes, byte_class cls) noexcept;
 // replaced by replacement. Throws std::bad_alloc.
 std::string replace_non_printable(std::span<const std::uint8_t> bytes, std::uint8_t replacement);
 
-namespace detail {
-// Reference version: one byte at a time.
-bool all_bytes_in_scalar(std::span<const std::uint8_t> bytes, byte_class cls) noexcept;
-}  // namespace detail
-
 }  // namespace zul::text

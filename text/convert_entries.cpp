@@ -1,9 +1,10 @@
 // Host adapters for byte-order marks, encoding normalisation, ISO 8859-1 /
 // Windows-1252 conversion and number formatting: each reads its arguments
 // (rbData for stored bytes, rbText for UTF-16 text), calls the pure worker
-// and builds the host result. None of them reports failures: a buffer that
-// cannot be had gives the null string. Nothing here keeps state between
-// calls, so calls from several threads are independent.
+// and builds the host result, all inside the silent policy: none of them
+// reports failures, and a buffer that cannot be had gives the null string.
+// Nothing here keeps state between calls, so calls from several threads are
+// independent.
 #include <cstdint>
 
 #include "plugin/exceptions.h"
@@ -34,21 +35,17 @@ REALstring build_from_handle(const txt::owned_handle& h, std::uint32_t encoding)
 // which hands them back as a UTF-8 string.
 REALstring decoding_to(REALstring s, const txt::single_byte_charset& set) {
   if (!s) return nullptr;
-  return quietly<REALstring>(nullptr, [&] {
-    rbData in(s);
-    return build_from_handle(txt::decode_single_byte(in.bytes(), set), kUTF16);
-  });
+  rbData in(s);
+  return build_from_handle(txt::decode_single_byte(in.bytes(), set), kUTF16);
 }
 
 // Any text, read as UTF-16, as bytes of the character set. The bytes carry
 // no declared encoding unless they are all ASCII.
 REALstring encoding_to(REALstring s, const txt::single_byte_charset& set) {
   if (!s) return nullptr;
-  return quietly<REALstring>(nullptr, [&] {
-    rbText text(s);
-    text.ConvertUTF16();
-    return build_from_handle(txt::encode_single_byte(text.utf16(), set), kUnknown);
-  });
+  rbText text(s);
+  text.ConvertUTF16();
+  return build_from_handle(txt::encode_single_byte(text.utf16(), set), kUnknown);
 }
 
 // The host's own conversion of s. An empty string gives the null string,
@@ -76,28 +73,48 @@ std::uint32_t encoding_of(txt::marker_form form) {
 
 }  // namespace
 
-int64_t DetectUnicodeMarkers(REALstring s) {
-  if (!s) return 0;
-  rbData in(s);
-  return txt::detect_unicode_marker(in.bytes());
+std::int64_t DetectUnicodeMarkers(REALstring s) noexcept {
+  return quietly<std::int64_t>(0, [&]() -> std::int64_t {
+    if (!s) return 0;
+    rbData in(s);
+    return txt::detect_unicode_marker(in.bytes());
+  });
 }
 
-REALstring GetUnicodeMarkers(int64_t kind) {
-  const auto marker = txt::unicode_marker_for(kind);
-  if (!marker) return nullptr;
-  return build_string(marker->bytes, encoding_of(marker->form));
+REALstring GetUnicodeMarkers(std::int64_t kind) noexcept {
+  return quietly<REALstring>(nullptr, [&]() -> REALstring {
+    const auto marker = txt::unicode_marker_for(kind);
+    if (!marker) return nullptr;
+    return build_string(marker->bytes, encoding_of(marker->form));
+  });
 }
 
-REALstring RBUnicodeString(REALstring s) { return host_conversion(s, kUTF16); }
-REALstring RBNativeString(REALstring s) { return host_conversion(s, kUTF8); }
-
-REALstring DecodingToISO8859(REALstring s) { return decoding_to(s, txt::kISO8859_1); }
-REALstring EncodingToISO8859(REALstring s) { return encoding_to(s, txt::kISO8859_1); }
-REALstring DecodingToCP1252(REALstring s) { return decoding_to(s, txt::kWindows1252); }
-REALstring EncodingToCP1252(REALstring s) { return encoding_to(s, txt::kWindows1252); }
-
-REALstring ScientificStrZUL(double d, int64_t digits) {
-  return build_string(txt::format_scientific(d, digits).view(), kASCII);
+REALstring RBUnicodeString(REALstring s) noexcept {
+  return quietly<REALstring>(nullptr, [&] { return host_conversion(s, kUTF16); });
+}
+REALstring RBNativeString(REALstring s) noexcept {
+  return quietly<REALstring>(nullptr, [&] { return host_conversion(s, kUTF8); });
 }
 
-REALstring StrZUL(double d) { return build_string(txt::format_plain(d).view(), kASCII); }
+REALstring DecodingToISO8859(REALstring s) noexcept {
+  return quietly<REALstring>(nullptr, [&] { return decoding_to(s, txt::kISO8859_1); });
+}
+REALstring EncodingToISO8859(REALstring s) noexcept {
+  return quietly<REALstring>(nullptr, [&] { return encoding_to(s, txt::kISO8859_1); });
+}
+REALstring DecodingToCP1252(REALstring s) noexcept {
+  return quietly<REALstring>(nullptr, [&] { return decoding_to(s, txt::kWindows1252); });
+}
+REALstring EncodingToCP1252(REALstring s) noexcept {
+  return quietly<REALstring>(nullptr, [&] { return encoding_to(s, txt::kWindows1252); });
+}
+
+REALstring ScientificStrZUL(double d, std::int64_t digits) noexcept {
+  return quietly<REALstring>(
+      nullptr, [&] { return build_string(txt::format_scientific(d, digits).view(), kASCII); });
+}
+
+REALstring StrZUL(double d) noexcept {
+  return quietly<REALstring>(nullptr,
+                             [&] { return build_string(txt::format_plain(d).view(), kASCII); });
+}

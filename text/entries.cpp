@@ -8,6 +8,7 @@
 #include <string>
 #include <string_view>
 
+#include "common/size_gate.h"
 #include "plugin/exceptions.h"
 #include "plugin/natives.h"
 #include "plugin/rb_data.h"
@@ -20,58 +21,62 @@ using namespace text_encoding;
 
 namespace {
 
-// The shared core of the three CheckUTF8ZUL overloads. No bytes (null data,
-// size 0 or negative) give the null string without reading the placeholder.
-REALstring CheckUTF8(const void* data, int64_t size, REALstring placeholder) {
+// The shared core of the three CheckUTF8ZUL overloads, run inside the trap.
+// No bytes (null data, size 0 or negative) give the null string without
+// reading the placeholder.
+REALstring CheckUTF8(const void* data, std::int64_t size, REALstring placeholder) {
   if (!data || size <= 0) return nullptr;
-  return trapped<REALstring>(nullptr, [&]() -> REALstring {
-    rbText ph(placeholder);
-    std::string_view text = ph.utf8();
-    text = text.substr(0, text.find('\0'));  // the placeholder ends at its first zero byte
-    const std::string out = zul::text::repair_utf8(
-        {static_cast<const std::uint8_t*>(data), static_cast<std::size_t>(size)}, text);
-    return build_string(out, kUTF8);
-  });
+  rbText ph(placeholder);
+  std::string_view text = ph.utf8();
+  text = text.substr(0, text.find('\0'));  // the placeholder ends at its first zero byte
+  const std::string out = zul::text::repair_utf8(
+      {static_cast<const std::uint8_t*>(data), static_cast<std::size_t>(size)}, text);
+  return build_string(out, kUTF8);
 }
 
 }  // namespace
 
-REALstring CheckUTF8p(void* data, int64_t size, REALstring placeholder) {
-  return CheckUTF8(data, size, placeholder);
+REALstring CheckUTF8p(void* data, std::int64_t size, REALstring placeholder) noexcept {
+  return trapped<REALstring>(nullptr, [&] { return CheckUTF8(data, size, placeholder); });
 }
 
-REALstring CheckUTF8m(REALmemoryBlock mem, REALstring placeholder) {
-  rbData block(mem);
-  return CheckUTF8(block.data, block.length, placeholder);
+REALstring CheckUTF8m(REALmemoryBlock mem, REALstring placeholder) noexcept {
+  return trapped<REALstring>(nullptr, [&] {
+    rbData block(mem);
+    return CheckUTF8(block.data, block.length, placeholder);
+  });
 }
 
-REALstring CheckUTF8s(REALstring data, REALstring placeholder) {
-  rbData bytes(data);
-  return CheckUTF8(bytes.data, bytes.length, placeholder);
+REALstring CheckUTF8s(REALstring data, REALstring placeholder) noexcept {
+  return trapped<REALstring>(nullptr, [&] {
+    rbData bytes(data);
+    return CheckUTF8(bytes.data, bytes.length, placeholder);
+  });
 }
 
-REALstring ReplaceNonPrintableCharactersZUL(REALstring s, int64_t replace_value) {
-  // Failures are silent here: a buffer that cannot be had gives the null
-  // string, and nothing thrown may reach the host.
-  try {
+// Failures are silent here: a buffer that cannot be had gives the null string.
+REALstring ReplaceNonPrintableCharactersZUL(REALstring s, std::int64_t replace_value) noexcept {
+  return quietly<REALstring>(nullptr, [&]() -> REALstring {
     rbData bytes(s);
-    if (bytes.empty()) return nullptr;
+    if (bytes.empty() || !zul::fits_result(bytes.bytes().size())) return nullptr;
     const std::string out = zul::text::replace_non_printable(
         bytes.bytes(), static_cast<std::uint8_t>(replace_value & 0xFF));
     return build_string(out, kASCII);
-  } catch (...) {
-    return nullptr;
-  }
+  });
 }
 
-bool IsASCIIString1(REALstring s) {
-  rbData bytes(s);
-  return zul::text::all_bytes_in(bytes.bytes(), zul::text::byte_class::seven_bit);
+bool IsASCIIString1(REALstring s) noexcept {
+  return quietly(false, [&] {
+    rbData bytes(s);
+    return zul::text::all_bytes_in(bytes.bytes(), zul::text::byte_class::seven_bit);
+  });
 }
 
-bool IsASCIIString2(REALstring s, int64_t mode) {
-  const std::optional<zul::text::byte_class> cls = zul::text::byte_class_for_mode(mode);
-  if (!cls) return false;
-  rbData bytes(s);
-  return zul::text::all_bytes_in(bytes.bytes(), *cls);
+bool IsASCIIString2(REALstring s, std::int64_t mode) noexcept {
+  return quietly(false, [&] {
+    const std::optional<zul::text::byte_class> cls = zul::text::byte_class_for_mode(mode);
+    if (!cls) return false;
+    rbData bytes(s);
+    return zul::text::all_bytes_in(bytes.bytes(), *cls);
+  });
 }

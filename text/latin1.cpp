@@ -2,8 +2,8 @@
 // per byte into a handle sized once. Encoding uses a reverse map derived at
 // compile time from the same table (lowest byte first, as a search from
 // index 0 would find), plus a word-at-a-time copy of ASCII runs, which both
-// tables map to themselves; detail::encode_single_byte_scalar is the plain
-// search that tests compare it with.
+// tables map to themselves. Tests compare it with a plain table search
+// (tests/reference/latin1_reference.h).
 #include "text/latin1.h"
 
 #include <algorithm>
@@ -117,30 +117,4 @@ owned_handle encode_single_byte(std::span<const std::uint16_t> units,
   return finish(std::move(out), count);
 }
 
-namespace detail {
-
-int search_table(const charset_table& table, std::uint16_t unit) noexcept {
-  for (int k = 0; k < 256; ++k) {
-    if (table[k] == unit) return k;
-  }
-  return -1;
-}
-
-owned_handle encode_single_byte_scalar(std::span<const std::uint16_t> units,
-                                       const charset_table& table) noexcept {
-  if (units.empty()) return {};
-  owned_handle out(new_handle(units.size()));
-  if (!out) return {};
-  std::size_t count = 0;
-  {
-    handle_lock lock(out.get());
-    for (const std::uint16_t unit : units) {
-      const int b = search_table(table, unit);
-      if (b >= 0) lock.data()[count++] = static_cast<std::uint8_t>(b);
-    }
-  }
-  return finish(std::move(out), count);
-}
-
-}  // namespace detail
 }  // namespace zul::text

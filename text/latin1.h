@@ -74,14 +74,4 @@ owned_handle encode_single_byte(std::span<const std::uint16_t> units,
 // The byte that encodes unit, or -1 when the set does not hold it.
 int byte_for_unit(const single_byte_charset& set, std::uint16_t unit) noexcept;
 
-namespace detail {
-// The plain definition: search table from index 0 upwards for unit; -1 when
-// absent. byte_for_unit must agree with it for every unit.
-int search_table(const charset_table& table, std::uint16_t unit) noexcept;
-// Encoding one unit at a time through search_table; the reference for
-// encode_single_byte's fast paths.
-owned_handle encode_single_byte_scalar(std::span<const std::uint16_t> units,
-                                       const charset_table& table) noexcept;
-}  // namespace detail
-
 }  // namespace zul::text

@@ -1,78 +1,28 @@
 // UTF-8 repair in one forward pass: well_formed_prefix runs over the valid
 // stretch (eight ASCII bytes per step, then one table look-up per lead byte)
 // and the stretch is appended in one copy; only the byte where it stopped is
-// replaced, and the scan resumes right after it. The per-position reference
-// follows the well-formedness table row by row.
+// replaced, and the scan resumes right after it. Tests compare it with a
+// per-position reference (tests/reference/utf8_repair_reference.h).
 #include "text/utf8_repair.h"
 
+#include <algorithm>
 #include <array>
 #include <cstring>
-#include <limits>
-#include <stdexcept>
+
+#include "common/size_gate.h"
+#include "common/utf8.h"
 
 namespace zul::text {
 namespace {
 
-// One row of the well-formedness table, keyed by the first byte: the length
-// of the sequence (0: the byte begins none) and the range of the second
-// byte. Third and fourth bytes are always 80..BF.
-struct lead_row {
-  std::uint8_t length;
-  std::uint8_t second_low;
-  std::uint8_t second_high;
-};
-
-constexpr std::array<lead_row, 256> make_lead_table() {
-  std::array<lead_row, 256> t{};
-  for (int c = 0x00; c <= 0x7F; ++c) t[c] = {1, 0, 0};
-  for (int c = 0xC2; c <= 0xDF; ++c) t[c] = {2, 0x80, 0xBF};
-  t[0xE0] = {3, 0xA0, 0xBF};
-  for (int c = 0xE1; c <= 0xEC; ++c) t[c] = {3, 0x80, 0xBF};
-  t[0xED] = {3, 0x80, 0x9F};
-  t[0xEE] = t[0xEF] = {3, 0x80, 0xBF};
-  t[0xF0] = {4, 0x90, 0xBF};
-  for (int c = 0xF1; c <= 0xF3; ++c) t[c] = {4, 0x80, 0xBF};
-  t[0xF4] = {4, 0x80, 0x8F};
-  return t;
-}
-constexpr std::array<lead_row, 256> kLeadTable = make_lead_table();
-
 constexpr std::uint64_t kHighBits = 0x8080808080808080ull;
 
-bool in(std::uint8_t c, std::uint8_t low, std::uint8_t high) { return c >= low && c <= high; }
-
-std::size_t reserve_size(std::size_t n) {
-  if (n > std::numeric_limits<std::size_t>::max() - 4096) throw std::length_error("utf8 repair");
-  return n + 4096;
+// Each byte is kept or replaced: the worst case, capped at the limit.
+std::size_t reserve_size(std::size_t n, std::string_view placeholder, std::uint64_t limit) {
+  return worst_case_reserve(n, std::max<std::size_t>(placeholder.size(), 1), 0, limit);
 }
 
 }  // namespace
-
-std::size_t well_formed_length(bytes_view b) noexcept {
-  if (b.empty()) return 0;
-  const std::uint8_t c = b[0];
-  std::size_t length;
-  std::uint8_t low = 0x80, high = 0xBF;  // range of the second byte
-  if (c <= 0x7F) return 1;
-  if (in(c, 0xC2, 0xDF)) {
-    length = 2;
-  } else if (in(c, 0xE0, 0xEF)) {
-    length = 3;
-    if (c == 0xE0) low = 0xA0;
-    if (c == 0xED) high = 0x9F;
-  } else if (in(c, 0xF0, 0xF4)) {
-    length = 4;
-    if (c == 0xF0) low = 0x90;
-    if (c == 0xF4) high = 0x8F;
-  } else {
-    return 0;  // 80..C1 and F5..FF begin nothing
-  }
-  if (b.size() < length || !in(b[1], low, high)) return 0;
-  for (std::size_t k = 2; k < length; ++k) {
-    if (!in(b[k], 0x80, 0xBF)) return 0;
-  }
-  return length;
-}
 
 std::size_t well_formed_prefix(bytes_view bytes) noexcept {
   const std::uint8_t* const p = bytes.data();
@@ -93,50 +43,31 @@ std::size_t well_formed_prefix(bytes_view bytes) noexcept {
       ++i;
       continue;
     }
-    const lead_row row = kLeadTable[c];
+    const utf8_lead row = kUtf8Leads[c];
     if (row.length == 0 || n - i < row.length) return i;
     if (p[i + 1] < row.second_low || p[i + 1] > row.second_high) return i;
-    if (row.length >= 3 && (p[i + 2] & 0xC0) != 0x80) return i;
-    if (row.length == 4 && (p[i + 3] & 0xC0) != 0x80) return i;
+    if (row.length >= 3 && !is_utf8_continuation(p[i + 2])) return i;
+    if (row.length == 4 && !is_utf8_continuation(p[i + 3])) return i;
     i += row.length;
   }
   return n;
 }
 
-std::string repair_utf8(bytes_view bytes, std::string_view placeholder) {
+std::string repair_utf8(bytes_view bytes, std::string_view placeholder, std::uint64_t limit) {
   std::string out;
-  out.reserve(reserve_size(bytes.size()));
+  out.reserve(reserve_size(bytes.size(), placeholder, limit));
   std::size_t i = 0;
   while (i < bytes.size()) {
     const std::size_t run = well_formed_prefix(bytes.subspan(i));
+    if (!make_room(out, run, limit)) return {};
     out.append(reinterpret_cast<const char*>(bytes.data() + i), run);
     i += run;
     if (i == bytes.size()) break;
+    if (!make_room(out, placeholder.size(), limit)) return {};
     out.append(placeholder);
     ++i;
   }
   return out;
 }
-
-namespace detail {
-
-std::string repair_utf8_scalar(bytes_view bytes, std::string_view placeholder) {
-  std::string out;
-  out.reserve(reserve_size(bytes.size()));
-  std::size_t i = 0;
-  while (i < bytes.size()) {
-    const std::size_t length = well_formed_length(bytes.subspan(i));
-    if (length == 0) {
-      out.append(placeholder);
-      ++i;
-    } else {
-      out.append(reinterpret_cast<const char*>(bytes.data() + i), length);
-      i += length;
-    }
-  }
-  return out;
-}
-
-}  // namespace detail
 
 }  // namespace zul::text

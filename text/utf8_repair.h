@@ -11,14 +11,10 @@
 #include <string>
 #include <string_view>
 
+#include "common/bytes.h"
+#include "common/size_gate.h"
+
 namespace zul::text {
-
-using bytes_view = std::span<const std::uint8_t>;
-
-// Length (1 to 4) of the well-formed sequence that bytes begins with, or 0
-// when its first byte begins none (also when the end cuts the sequence short
-// or bytes is empty).
-std::size_t well_formed_length(bytes_view bytes) noexcept;
 
 // Length of the longest prefix of bytes made of whole well-formed sequences:
 // the offset of the first byte that begins no well-formed sequence, or
@@ -27,13 +23,10 @@ std::size_t well_formed_prefix(bytes_view bytes) noexcept;
 
 // bytes with each byte that begins no well-formed sequence replaced by
 // placeholder (an empty placeholder drops such bytes). The output is
-// reserved once at bytes.size() + 4096 bytes. Throws std::bad_alloc or
-// std::length_error when the output cannot be allocated.
-std::string repair_utf8(bytes_view bytes, std::string_view placeholder);
-
-namespace detail {
-// Reference version: judges every position with well_formed_length.
-std::string repair_utf8_scalar(bytes_view bytes, std::string_view placeholder);
-}  // namespace detail
+// reserved once for the worst case, capped at limit; output that would pass
+// limit bytes gives "" and the repair stops there. Throws std::bad_alloc
+// when the output cannot be allocated.
+std::string repair_utf8(bytes_view bytes, std::string_view placeholder,
+                        std::uint64_t limit = kMaxResultBytes);
 
 }  // namespace zul::text
