@@ -44,6 +44,9 @@ class rbText {
   }
 
   bool is_ascii() const { return is_ascii_; }
+  // True when the host could not give the text in a form asked for (the
+  // form then reads as empty text).
+  bool host_failed() const { return host_failed_; }
 
  private:
   enum Slot { kASCII = 0, kUTF8 = 1, kUTF16 = 2, kUTF32 = 3, kSlots = 4 };
