@@ -12,6 +12,8 @@
 
 namespace {
 
+using namespace text_encoding;
+
 using zul_host::Host;
 
 Host& host() {
@@ -38,14 +40,14 @@ const std::string& text(std::size_t size) {
 REALstring host_text(std::size_t size) {
   static std::map<std::size_t, REALstring> cache;
   auto [it, fresh] = cache.try_emplace(size);
-  if (fresh) it->second = host().make_string(text(size), zul_host::kASCII);
+  if (fresh) it->second = host().make_string(text(size), text_encoding::kASCII);
   return it->second;
 }
 
 REALstring host_set(const char* set) {
   static std::map<std::string, REALstring> cache;
   auto [it, fresh] = cache.try_emplace(set);
-  if (fresh) it->second = host().make_string(set, zul_host::kASCII);
+  if (fresh) it->second = host().make_string(set, text_encoding::kASCII);
   return it->second;
 }
 

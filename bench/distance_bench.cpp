@@ -1,61 +1,101 @@
-// Edit distance of two texts of 1,000 code points (bit-vector version beside
-// the row-by-row reference), Jaro-Winkler on the same pair, and UTF-8 repair
-// and byte-class checks over 1 MiB (prefix-skipping version beside the
-// per-position reference), on pure workers without the host in the way.
+// Both string distances on random pairs of equal length (8, 64, 1,000 and
+// 10,000 code points; arg 1 picks a-z or code points above U+00FF), each
+// beside the versions they replaced, kept as the references, and beside a
+// memcpy of the pair as the yardstick; then UTF-8 repair and byte-class
+// checks over 1 MiB (prefix-skipping version beside the per-position
+// reference). Pure workers, without the host in the way.
 #include <benchmark/benchmark.h>
 
 #include <array>
+#include <cstring>
+#include <map>
 #include <random>
 #include <string>
+#include <utility>
 #include <vector>
 
 #include "search/distance.h"
 #include "tests/reference/char_class_reference.h"
+#include "tests/reference/distance_reference.h"
 #include "tests/reference/utf8_repair_reference.h"
 #include "text/char_class.h"
 #include "text/utf8_repair.h"
 
 namespace {
 
-// Two related texts: b is a with about one character in ten changed.
 struct text_pair {
   std::vector<std::uint32_t> a, b;
 };
 
-const text_pair& pair_1k() {
-  static const text_pair p = [] {
-    std::mt19937 rng(1);
-    text_pair made;
-    made.a.resize(1000);
-    for (auto& c : made.a) c = 'a' + rng() % 26;
-    made.b = made.a;
-    for (auto& c : made.b) {
-      if (rng() % 10 == 0) c = rng() % 2 ? 0x1F600 : 'a' + rng() % 26;
+// Two independent random texts of len code points: a-z (kind 0), or 26
+// letters of the CJK block (kind 1), so both the byte table and the hashed
+// code points are measured.
+const text_pair& random_pair(std::size_t len, int kind) {
+  static std::map<std::pair<std::size_t, int>, text_pair> cache;
+  auto [it, fresh] = cache.try_emplace({len, kind});
+  if (fresh) {
+    std::mt19937 rng(static_cast<unsigned>(len) * 2 + static_cast<unsigned>(kind));
+    const std::uint32_t base = kind == 0 ? 'a' : 0x4E00;
+    for (auto* t : {&it->second.a, &it->second.b}) {
+      t->resize(len);
+      for (auto& c : *t) c = base + rng() % 26;
     }
-    return made;
-  }();
-  return p;
+  }
+  return it->second;
 }
 
-void BM_edit_distance_bits(benchmark::State& state) {
-  const auto& p = pair_1k();
-  for (auto _ : state) benchmark::DoNotOptimize(zul::search::edit_distance(p.a, p.b));
-  state.SetItemsProcessed(state.iterations() * 1000 * 1000);  // matrix cells
+template <class Distance>
+void run_pairs(benchmark::State& state, Distance distance) {
+  const auto& p =
+      random_pair(static_cast<std::size_t>(state.range(0)), static_cast<int>(state.range(1)));
+  for (auto _ : state) benchmark::DoNotOptimize(distance(p.a, p.b));
+  state.SetItemsProcessed(state.iterations());  // pairs
 }
-BENCHMARK(BM_edit_distance_bits);
 
-void BM_edit_distance_rows(benchmark::State& state) {
-  const auto& p = pair_1k();
-  for (auto _ : state) benchmark::DoNotOptimize(zul::search::detail::edit_distance_rows(p.a, p.b));
-  state.SetItemsProcessed(state.iterations() * 1000 * 1000);
+void pair_lengths(benchmark::internal::Benchmark* b) {
+  for (const int kind : {0, 1}) {
+    for (const int len : {8, 64, 1000, 10000}) b->Args({len, kind});
+  }
 }
-BENCHMARK(BM_edit_distance_rows);
+
+void BM_memcpy_pair(benchmark::State& state) {
+  const auto& p =
+      random_pair(static_cast<std::size_t>(state.range(0)), static_cast<int>(state.range(1)));
+  std::vector<std::uint32_t> copy(p.a.size() + p.b.size());
+  for (auto _ : state) {
+    std::memcpy(copy.data(), p.a.data(), p.a.size() * 4);
+    std::memcpy(copy.data() + p.a.size(), p.b.data(), p.b.size() * 4);
+    benchmark::DoNotOptimize(copy.data());
+    benchmark::ClobberMemory();
+  }
+  state.SetItemsProcessed(state.iterations());
+}
+BENCHMARK(BM_memcpy_pair)->Apply(pair_lengths);
 
 void BM_jaro_winkler(benchmark::State& state) {
-  const auto& p = pair_1k();
-  for (auto _ : state) benchmark::DoNotOptimize(zul::search::jaro_winkler_distance(p.a, p.b));
+  run_pairs(state, zul::search::jaro_winkler_distance);
 }
-BENCHMARK(BM_jaro_winkler);
+BENCHMARK(BM_jaro_winkler)->Apply(pair_lengths);
+
+void BM_jaro_winkler_reference(benchmark::State& state) {
+  run_pairs(state, zul::reference::jaro_winkler_distance_reference);
+}
+BENCHMARK(BM_jaro_winkler_reference)->Apply(pair_lengths);
+
+void BM_edit_distance(benchmark::State& state) { run_pairs(state, zul::search::edit_distance); }
+BENCHMARK(BM_edit_distance)->Apply(pair_lengths);
+
+// What edit_distance did before the one-word path: blocks over the longer
+// text for every length.
+void BM_edit_distance_blocks(benchmark::State& state) {
+  run_pairs(state, zul::search::detail::edit_distance_blocks);
+}
+BENCHMARK(BM_edit_distance_blocks)->Apply(pair_lengths);
+
+void BM_edit_distance_reference(benchmark::State& state) {
+  run_pairs(state, zul::reference::edit_distance_reference);
+}
+BENCHMARK(BM_edit_distance_reference)->Apply(pair_lengths);
 
 // 1 MiB of text: arg 0 plain ASCII, arg 1 mixed Latin text with accents,
 // emoji and one broken byte per KiB.

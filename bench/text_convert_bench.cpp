@@ -1,6 +1,6 @@
 // Windows-1252 encoding (reverse map and ASCII words beside the plain table
-// search), decoding, and number formatting beside the C library's snprintf
-// on the same values. Calls the pure workers directly: no host in the loop.
+// search) and decoding (number formatting: number_format_bench.cpp). Calls
+// the pure workers directly: no host in the loop.
 #include <benchmark/benchmark.h>
 
 #include <cstdio>
@@ -11,7 +11,6 @@
 
 #include "tests/reference/latin1_reference.h"
 #include "text/latin1.h"
-#include "text/number_format.h"
 
 namespace {
 
@@ -58,52 +57,8 @@ void BM_decode_cp1252(benchmark::State& state) {
   state.SetBytesProcessed(static_cast<std::int64_t>(state.iterations()) * state.range(0));
 }
 
-const std::vector<double>& sample_doubles() {
-  static const std::vector<double> values = [] {
-    std::vector<double> v;
-    std::mt19937_64 random(5);
-    std::uniform_real_distribution<double> mantissa(1.0, 10.0);
-    for (int i = 0; i < 256; ++i)
-      v.push_back(std::ldexp(mantissa(random), static_cast<int>(random() % 100) - 50));
-    return v;
-  }();
-  return values;
-}
-
-void BM_format_plain(benchmark::State& state) {
-  std::size_t i = 0;
-  for (auto _ : state) benchmark::DoNotOptimize(txt::format_plain(sample_doubles()[i++ & 255]));
-}
-
-void BM_snprintf_fixed_99(benchmark::State& state) {
-  char buffer[500];
-  std::size_t i = 0;
-  for (auto _ : state) {
-    benchmark::DoNotOptimize(
-        std::snprintf(buffer, sizeof buffer, "%.99f", sample_doubles()[i++ & 255]));
-  }
-}
-
-void BM_format_scientific(benchmark::State& state) {
-  std::size_t i = 0;
-  for (auto _ : state)
-    benchmark::DoNotOptimize(txt::format_scientific(sample_doubles()[i++ & 255], 6));
-}
-
-void BM_snprintf_scientific(benchmark::State& state) {
-  char buffer[500];
-  std::size_t i = 0;
-  for (auto _ : state) {
-    benchmark::DoNotOptimize(std::snprintf(buffer, 499, "%.6e", sample_doubles()[i++ & 255]));
-  }
-}
-
 BENCHMARK(BM_encode_cp1252)->Arg(1 << 10)->Arg(1 << 20)->Arg(64 << 20);
 BENCHMARK(BM_encode_cp1252_table_search)->Arg(1 << 10)->Arg(1 << 20);
 BENCHMARK(BM_decode_cp1252)->Arg(1 << 10)->Arg(1 << 20)->Arg(64 << 20);
-BENCHMARK(BM_format_plain);
-BENCHMARK(BM_snprintf_fixed_99);
-BENCHMARK(BM_format_scientific);
-BENCHMARK(BM_snprintf_scientific);
 
 }  // namespace

@@ -1,22 +1,25 @@
-// Word-at-a-time bitwise combination of data with a repeating mask. Masks of
-// 1, 2, 4 or 8 bytes become one 64-bit pattern word; any other mask is walked
-// in segments that each meet the mask from its start, combined eight bytes
-// at a time (the compiler widens these loops to vector registers). Loads and
-// stores go through memcpy, so nothing is read past either input.
+// Bitwise combination of data with a repeating mask. The mask is first
+// repeated (once per call, on the stack) into a pattern of at least
+// kMinSegment bytes, or of the data's length when that is shorter; the data
+// is then walked in segments that each meet the pattern from its start, and
+// every segment is one call of the machine's run kernel
+// (binary/bitwise_kernels.h), so masks of every length and offset run at
+// vector speed. Nothing is read past either input.
 #include "binary/bitwise.h"
 
 #include <algorithm>
 #include <array>
 #include <cstring>
 
+#include "binary/bitwise_kernels.h"
+
 namespace zul::binary {
 namespace detail {
 namespace {
 
-constexpr std::size_t kWord = 8;
-// Short masks are first repeated into a pattern at least this long, so that
-// segments stay long enough for the word loop to pay off.
-constexpr std::size_t kMinSegment = 64;
+// Segments at least this long keep the per-call cost of the run kernel
+// small against the bytes it combines.
+constexpr std::size_t kMinSegment = 1024;
 
 // Positions 0..255, the byte stream that xor_positions mixes in.
 constexpr std::array<std::uint8_t, 256> kPositions = [] {
@@ -25,76 +28,33 @@ constexpr std::array<std::uint8_t, 256> kPositions = [] {
   return ramp;
 }();
 
-struct and_op {
-  template <class T>
-  T operator()(T a, T b) const {
-    return static_cast<T>(a & b);
-  }
-};
-struct or_op {
-  template <class T>
-  T operator()(T a, T b) const {
-    return static_cast<T>(a | b);
-  }
-};
-struct xor_op {
-  template <class T>
-  T operator()(T a, T b) const {
-    return static_cast<T>(a ^ b);
-  }
-};
-
-std::uint64_t load(const std::uint8_t* p) {
-  std::uint64_t w;
-  std::memcpy(&w, p, kWord);
-  return w;
-}
-void store(std::uint8_t* p, std::uint64_t w) { std::memcpy(p, &w, kWord); }
-
-// out[i] = a[i] op b[i] for i < n: whole words, then the bytes left over.
-template <class Op>
-void combine_run(Op op, const std::uint8_t* a, const std::uint8_t* b, std::uint8_t* out,
-                 std::size_t n) {
-  std::size_t i = 0;
-  for (; i + kWord <= n; i += kWord) store(out + i, op(load(a + i), load(b + i)));
-  for (; i < n; ++i) out[i] = op(a[i], b[i]);
-}
-
-// A mask whose length divides 8 repeats exactly once per word: build that
-// word (starting at mask index start) and apply it to every word of data.
-template <class Op>
-void combine_pattern_word(Op op, bytes_view data, bytes_view mask, std::size_t start,
-                          std::uint8_t* out) {
-  std::uint8_t pattern[kWord];
-  for (std::size_t j = 0; j < kWord; ++j) pattern[j] = mask[(start + j) % mask.size()];
-  const std::uint64_t word = load(pattern);
-  const std::size_t n = data.size();
-  std::size_t i = 0;
-  for (; i + kWord <= n; i += kWord) store(out + i, op(load(data.data() + i), word));
-  for (; i < n; ++i) out[i] = op(data[i], pattern[i % kWord]);
-}
-
-template <class Op>
-void combine_segments(Op op, bytes_view data, bytes_view mask, std::size_t start,
+void combine_segments(bit_op op, bytes_view data, bytes_view mask, std::size_t start,
                       std::uint8_t* out) {
+  const run_kernel run = active_bitwise_kernels().run[static_cast<int>(op)];
   const std::size_t m = mask.size();
-  if (kWord % m == 0) return combine_pattern_word(op, data, mask, start, out);
+  const std::size_t n = data.size();
 
   // A short mask repeated a whole number of times is the same mask as far as
   // the byte rule goes, and index start < m means the same byte in both.
+  // Copies double in length, so building it costs a few memcpy calls.
   std::uint8_t repeated[2 * kMinSegment];  // copies * m < kMinSegment + m
-  if (m < kMinSegment && data.size() > m) {
-    const std::size_t copies = (kMinSegment + m - 1) / m;
-    for (std::size_t j = 0; j < copies * m; ++j) repeated[j] = mask[j % m];
-    mask = bytes_view(repeated, copies * m);
+  if (m < kMinSegment && n > m - start) {
+    const std::size_t want = std::min(kMinSegment, n + start);
+    const std::size_t total = (want + m - 1) / m * m;
+    std::memcpy(repeated, mask.data(), m);
+    for (std::size_t have = m; have < total;) {
+      const std::size_t more = std::min(have, total - have);
+      std::memcpy(repeated + have, repeated, more);
+      have += more;
+    }
+    mask = bytes_view(repeated, total);
   }
 
-  const std::size_t n = data.size();
   std::size_t pos = 0;
   std::size_t k = start;
   while (pos < n) {
     const std::size_t len = std::min(mask.size() - k, n - pos);
-    combine_run(op, data.data() + pos, mask.data() + k, out + pos, len);
+    run(data.data() + pos, mask.data() + k, out + pos, len);
     pos += len;
     k = 0;  // the mask walk wraps to its first byte, never back to start
   }
@@ -110,18 +70,11 @@ std::size_t mask_start(std::int64_t offset, std::size_t m) {
 
 void combine_fast(bit_op op, bytes_view data, bytes_view mask, std::size_t start,
                   std::uint8_t* out) {
-  switch (op) {
-    case bit_op::kAnd:
-      return combine_segments(and_op{}, data, mask, start, out);
-    case bit_op::kOr:
-      return combine_segments(or_op{}, data, mask, start, out);
-    case bit_op::kXor:
-      return combine_segments(xor_op{}, data, mask, start, out);
-  }
+  combine_segments(op, data, mask, start, out);
 }
 
 void xor_positions(std::uint8_t* out, std::size_t n) {
-  combine_segments(xor_op{}, bytes_view(out, n), kPositions, 0, out);
+  combine_segments(bit_op::kXor, bytes_view(out, n), kPositions, 0, out);
 }
 
 }  // namespace detail

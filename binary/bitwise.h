@@ -38,7 +38,7 @@ enum class bit_op { kAnd, kOr, kXor };
 std::size_t mask_start(std::int64_t offset, std::size_t m);
 
 // The byte rule out[i] = data[i] op mask[(start + i) mod m], for i <
-// data.size(), eight bytes at a time where the mask allows it. out has room
+// data.size(), in long runs of the machine's run kernel. out has room
 // for data.size() bytes and may be data.data() itself; m >= 1 and start < m.
 void combine_fast(bit_op op, bytes_view data, bytes_view mask, std::size_t start,
                   std::uint8_t* out);

@@ -5,6 +5,7 @@
 
 #include <gtest/gtest.h>
 
+#include <algorithm>
 #include <string>
 #include <vector>
 
@@ -43,6 +44,29 @@ TEST(combine_fast, matches_byte_rule) {
                                  << " start " << start << " skew " << skew;
           }
         }
+      }
+    }
+  }
+}
+
+// Data longer than the repeated-mask pattern: segments wrap many times,
+// for masks shorter and longer than the pattern and every kind of start.
+TEST(combine_fast, long_data_wraps_the_mask) {
+  const auto data_pool = noise(5000, 4);
+  const auto mask_pool = noise(3000, 5);
+  for (std::size_t m : {1u, 3u, 7u, 64u, 1000u, 1023u, 1025u, 3000u}) {
+    for (std::size_t n : {1500u, 4999u}) {
+      for (std::size_t start : {std::size_t{0}, m / 2, m - 1}) {
+        const bytes_view data(data_pool.data(), n);
+        const bytes_view mask(mask_pool.data(), m);
+        const std::string rule =
+            reference::combine_reference(detail::bit_op::kXor, data, mask, start);
+        std::vector<std::uint8_t> got(n);
+        detail::combine_fast(detail::bit_op::kXor, data, mask, start, got.data());
+        ASSERT_TRUE(
+            std::equal(got.begin(), got.end(), rule.begin(),
+                       [](std::uint8_t g, char w) { return g == static_cast<std::uint8_t>(w); }))
+            << "m " << m << " n " << n << " start " << start;
       }
     }
   }

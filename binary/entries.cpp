@@ -72,7 +72,7 @@ REALstring StringOR(REALstring a, REALstring b) noexcept {
   });
 }
 
-REALstring StringXOR(REALstring data, REALstring mask, int64_t mask_offset) noexcept {
+REALstring StringXOR(REALstring data, REALstring mask, std::int64_t mask_offset) noexcept {
   if (!data || !mask) return nullptr;
   return quietly<REALstring>(nullptr, [&] {
     const rbData d(data), m(mask);
@@ -81,7 +81,7 @@ REALstring StringXOR(REALstring data, REALstring mask, int64_t mask_offset) noex
   });
 }
 
-REALstring StringXOR2(REALstring data, REALstring mask, int64_t mask_offset) noexcept {
+REALstring StringXOR2(REALstring data, REALstring mask, std::int64_t mask_offset) noexcept {
   if (!data || !mask) return nullptr;
   return quietly<REALstring>(nullptr, [&] {
     const rbData d(data), m(mask);
@@ -110,12 +110,13 @@ REALstring ConcatBinaryStringsZUL2(REALstring a, REALstring b) noexcept {
                              [&] { return concat(a, b, nullptr, nullptr, nullptr, nullptr); });
 }
 
-REALstring CreateStringZUL(int64_t length, REALstring content) noexcept {
+REALstring CreateStringZUL(std::int64_t length, REALstring content) noexcept {
   if (length < 1) return nullptr;
   return trapped<REALstring>(nullptr, [&]() -> REALstring {
     const rbData c(content);
-    // The work buffer holds length + one pattern unit + 4 bytes; a size that
-    // does not fit in 64 bits cannot be allocated.
+    // A length for which length + one pattern unit + 4 is no positive 64-bit
+    // size counts as a failed allocation (OutOfMemoryException); the output
+    // itself is exactly length bytes.
     const std::int64_t unit = c.length == 0 ? 1 : c.length;
     if (length > std::numeric_limits<std::int64_t>::max() - unit - 4) throw std::bad_alloc();
     if (!zul::fits_result(static_cast<std::uint64_t>(length))) return nullptr;
@@ -127,7 +128,7 @@ REALstring CreateStringZUL(int64_t length, REALstring content) noexcept {
   });
 }
 
-REALstring RandomBytesStringZUL(int64_t length, signed char ascii) noexcept {
+REALstring RandomBytesStringZUL(std::int64_t length, signed char ascii) noexcept {
   if (length < 1 || !zul::fits_result(static_cast<std::uint64_t>(length))) return nullptr;
   return quietly<REALstring>(nullptr, [&] {
     const bool as_ascii = ascii != 0;
@@ -154,8 +155,9 @@ REALstring DecodingToHex(REALstring s) noexcept {
   });
 }
 
-REALstring Hexstring(REALstring input, int64_t hexlen, int64_t linelen, REALstring linestart,
-                     REALstring lineend, REALstring spacer, REALstring filler) noexcept {
+REALstring Hexstring(REALstring input, std::int64_t hexlen, std::int64_t linelen,
+                     REALstring linestart, REALstring lineend, REALstring spacer,
+                     REALstring filler) noexcept {
   if (!input || hexlen == 0 || linelen == 0) return nullptr;
   return trapped<REALstring>(nullptr, [&] {
     const rbData in(input), fill(filler);
@@ -166,12 +168,12 @@ REALstring Hexstring(REALstring input, int64_t hexlen, int64_t linelen, REALstri
   });
 }
 
-REALarray GetStringsZULp(void* data, int64_t size, int64_t min_length) noexcept {
+REALarray GetStringsZULp(void* data, std::int64_t size, std::int64_t min_length) noexcept {
   if (size < 0) return nullptr;
   return quietly<REALarray>(nullptr, [&] { return collect_runs(data, size, min_length); });
 }
 
-REALarray GetStringsZULm(REALmemoryBlock data, int64_t min_length) noexcept {
+REALarray GetStringsZULm(REALmemoryBlock data, std::int64_t min_length) noexcept {
   if (!data) return nullptr;
   return quietly<REALarray>(nullptr, [&] {
     const rbData block(data);
@@ -179,7 +181,7 @@ REALarray GetStringsZULm(REALmemoryBlock data, int64_t min_length) noexcept {
   });
 }
 
-REALarray GetStringsZULs(REALstring data, int64_t min_length) noexcept {
+REALarray GetStringsZULs(REALstring data, std::int64_t min_length) noexcept {
   if (!data) return nullptr;
   return quietly<REALarray>(nullptr, [&] {
     const rbData s(data);

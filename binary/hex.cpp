@@ -1,13 +1,16 @@
-// Hex encoding turns four bytes at a time into eight digits inside one 64-bit
-// word (SWAR), finishing through a 256-entry table of digit pairs; decoding
-// maps characters through the shared value table in which every non-digit
-// is 0.
+// Hex encoding and decoding run the machine's hex kernels (byte shuffles,
+// binary/hex_kernels_x86.cpp). The scalar path, their fallback and tail,
+// turns four bytes at a time into eight digits inside one 64-bit word
+// (SWAR), finishing through a 256-entry table of digit pairs; it decodes
+// through the shared value table in which every non-digit is 0.
 #include "binary/hex.h"
 
 #include <array>
+#include <atomic>
 #include <bit>
 #include <cstring>
 
+#include "binary/hex_kernels.h"
 #include "common/hex_digits.h"
 
 namespace zul::binary {
@@ -41,26 +44,51 @@ std::uint64_t digits_of_four(const std::uint8_t* in) {
 
 }  // namespace
 
+namespace detail {
+
+void encode_hex_scalar(const std::uint8_t* in, std::size_t n, char* out) noexcept {
+  static_assert(std::endian::native == std::endian::little, "digit lanes assume little-endian");
+  std::size_t i = 0;
+  for (; i + 4 <= n; i += 4, out += 8) {
+    const std::uint64_t eight = digits_of_four(in + i);
+    std::memcpy(out, &eight, 8);
+  }
+  for (; i < n; ++i, out += 2) std::memcpy(out, kDigitPairs[in[i]].data(), 2);
+}
+
+void decode_hex_scalar(const char* in, std::size_t n, std::uint8_t* out) noexcept {
+  for (std::size_t k = 0; k < n; ++k, in += 2) {
+    out[k] = static_cast<std::uint8_t>(hex_value(in[0]) << 4 | hex_value(in[1]));
+  }
+}
+
+namespace {
+constexpr hex_kernels kScalar{encode_hex_scalar, decode_hex_scalar};
+#if defined(__x86_64__) || defined(_M_X64)
+constexpr hex_kernels kAvx2{encode_hex_avx2, decode_hex_avx2};
+constexpr hex_kernels kAvx512{encode_hex_avx512, decode_hex_avx512};
+constexpr simd::family_tables<hex_kernels> kTables{&kScalar, nullptr, &kAvx2, &kAvx512, nullptr};
+#else
+constexpr simd::family_tables<hex_kernels> kTables{&kScalar};
+#endif
+std::atomic<const hex_kernels*> active_kernels{nullptr};
+}  // namespace
+
+const simd::family_tables<hex_kernels>& hex_tables() noexcept { return kTables; }
+
+}  // namespace detail
+
 std::string encode_hex(std::span<const std::uint8_t> bytes) {
   std::string out(2 * bytes.size(), '\0');
-  char* p = out.data();
-  std::size_t i = 0;
-  static_assert(std::endian::native == std::endian::little, "digit lanes assume little-endian");
-  for (; i + 4 <= bytes.size(); i += 4, p += 8) {
-    const std::uint64_t eight = digits_of_four(bytes.data() + i);
-    std::memcpy(p, &eight, 8);
-  }
-  for (; i < bytes.size(); ++i, p += 2) std::memcpy(p, kDigitPairs[bytes[i]].data(), 2);
+  simd::active(detail::hex_tables(), detail::active_kernels)
+      .encode(bytes.data(), bytes.size(), out.data());
   return out;
 }
 
 std::string decode_hex(std::string_view text) {
   std::string out(text.size() / 2, '\0');
-  const char* p = text.data();
-  for (char& b : out) {
-    b = static_cast<char>(hex_value(p[0]) << 4 | hex_value(p[1]));
-    p += 2;
-  }
+  simd::active(detail::hex_tables(), detail::active_kernels)
+      .decode(text.data(), out.size(), reinterpret_cast<std::uint8_t*>(out.data()));
   return out;
 }
 

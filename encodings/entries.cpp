@@ -63,7 +63,7 @@ REALstring build_utf32(const enc::code_points& text) {
 }  // namespace
 
 // URL percent-encoding. Space and "+" follow this call's options only.
-REALstring EncodingToURL2(REALstring s, int64_t options) noexcept {
+REALstring EncodingToURL2(REALstring s, std::int64_t options) noexcept {
   if (!s) return nullptr;
   return quietly<REALstring>(nullptr, [&] {
     rbData in(s);
@@ -73,7 +73,7 @@ REALstring EncodingToURL2(REALstring s, int64_t options) noexcept {
 
 REALstring EncodingToURL1(REALstring s) noexcept { return EncodingToURL2(s, 0); }
 
-REALstring DecodingToURL2(REALstring s, int64_t options) noexcept {
+REALstring DecodingToURL2(REALstring s, std::int64_t options) noexcept {
   if (!s) return nullptr;
   return quietly<REALstring>(nullptr, [&] {
     return decode_stored_bytes(s,
@@ -84,7 +84,7 @@ REALstring DecodingToURL2(REALstring s, int64_t options) noexcept {
 REALstring DecodingToURL1(REALstring s) noexcept { return DecodingToURL2(s, 0); }
 
 // HTML character references over the string's code points.
-REALstring EncodingToHTML(REALstring s, int64_t options) noexcept {
+REALstring EncodingToHTML(REALstring s, std::int64_t options) noexcept {
   if (!s) return nullptr;
   return trapped<REALstring>(nullptr, [&] {
     return with_code_points(s, [&](enc::code_point_view chars) {
@@ -103,7 +103,7 @@ REALstring DecodingToHTML(REALstring s) noexcept {
   });
 }
 
-REALstring EncodingToXML(REALstring s, int64_t options) noexcept {
+REALstring EncodingToXML(REALstring s, std::int64_t options) noexcept {
   if (!s) return nullptr;
   return trapped<REALstring>(nullptr, [&] {
     return with_code_points(s, [&](enc::code_point_view chars) {
@@ -113,17 +113,19 @@ REALstring EncodingToXML(REALstring s, int64_t options) noexcept {
   });
 }
 
-// Ready means: stored as ASCII-compatible text and holding only bytes 1..127
-// other than the five markup characters.
+// Ready means: empty, or stored as ASCII-compatible text and holding only
+// bytes 1..127 other than the five markup characters. An empty string is
+// ready whatever its encoding tag: there is nothing in it to escape.
 static bool is_markup_ready(REALstring s) {
   if (!s) return true;
+  rbData in(s);
+  if (in.empty()) return true;
   bool available = false;
   const std::uint32_t encoding = REALGetStringEncoding(s, &available);
   if (available && encoding != kMacRoman && encoding != kWindowsLatin1 && encoding != kASCII &&
       encoding != kUTF8) {
     return false;
   }
-  rbData in(s);
   return enc::is_markup_free_ascii(in.view());
 }
 
@@ -135,7 +137,7 @@ bool StringIsXMLready(REALstring s) noexcept {
 }
 
 // Quoted-printable over the stored bytes.
-REALstring EncodingToQuotedPrintable2(REALstring s, int64_t line_length) noexcept {
+REALstring EncodingToQuotedPrintable2(REALstring s, std::int64_t line_length) noexcept {
   if (!s) return nullptr;
   return trapped<REALstring>(nullptr, [&] {
     rbData in(s);

@@ -1,11 +1,11 @@
 // XML escaping: one pass, output reserved once for the worst case (6 code
 // points per character), capped at the result limit; the five markup
 // characters are the only ones XML 1.0 text needs escaped. The readiness
-// test is one table look-up per byte.
+// test is one byte-set search (vector kernels) for the first byte that is
+// not allowed.
 #include "encodings/xml.h"
 
-#include <array>
-
+#include "common/byte_set.h"
 #include "common/markup.h"
 #include "common/size_gate.h"
 
@@ -20,11 +20,14 @@ bool append(code_points& out, std::string_view ascii, std::uint64_t limit) {
   return true;
 }
 
-// Bytes a ready string may hold: 1..127 except the five markup bytes.
-constexpr std::array<bool, 256> kReadyByte = [] {
-  std::array<bool, 256> ready{};
-  for (std::uint32_t b = 1; b < 128; ++b) ready[b] = !is_markup(b);
-  return ready;
+// Bytes a ready string may not hold: 0, 128 and above, the five markup
+// bytes. The check is one byte-set search for the first of them.
+constexpr simd::byte_set kNotReady = [] {
+  simd::byte_set not_ready;
+  for (std::uint32_t b = 0; b < 256; ++b) {
+    if (b == 0 || b >= 128 || is_markup(b)) not_ready.add(static_cast<std::uint8_t>(b));
+  }
+  return not_ready;
 }();
 
 }  // namespace
@@ -71,10 +74,7 @@ code_points encode_xml(code_point_view text, std::int64_t options, std::uint64_t
 }
 
 bool is_markup_free_ascii(std::string_view bytes) {
-  for (const char b : bytes) {
-    if (!kReadyByte[static_cast<std::uint8_t>(b)]) return false;
-  }
-  return true;
+  return simd::find_first_in_set(kNotReady, bytes_of(bytes)) == bytes.size();
 }
 
 }  // namespace zul::encodings

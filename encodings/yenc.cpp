@@ -1,18 +1,22 @@
-// yEnc decoding: runs between "=" escapes are a plain subtraction of 42,
-// which the compiler vectorises; escapes are handled one at a time. One
-// output buffer of the input's size, trimmed at the end.
+// yEnc decoding runs the machine's kernel (encodings/yenc_x86.cpp:
+// AVX-512 VBMI2 compress). The scalar path, fallback and tail: runs between
+// "=" escapes are a plain subtraction of 42, which the compiler vectorises;
+// escapes are handled one at a time. One output buffer of the input's size,
+// trimmed at the end.
 #include "encodings/yenc.h"
 
+#include <atomic>
 #include <cstdint>
 #include <cstring>
 
-namespace zul::encodings {
+#include "common/cpu.h"
+#include "encodings/yenc_kernels.h"
 
-std::string decode_yenc(std::string_view in) {
-  const std::size_t n = in.size();
-  std::string out(n, '\0');
-  auto* o = reinterpret_cast<std::uint8_t*>(out.data());
-  const auto* p = reinterpret_cast<const std::uint8_t*>(in.data());
+namespace zul::encodings {
+namespace detail {
+
+std::size_t decode_yenc_scalar(const std::uint8_t* p, std::size_t n, std::uint8_t* out) noexcept {
+  std::uint8_t* o = out;
   std::size_t i = 0;
   while (i < n) {
     const void* eq = std::memchr(p + i, '=', n - i);
@@ -26,7 +30,38 @@ std::string decode_yenc(std::string_view in) {
     *o++ = static_cast<std::uint8_t>(escaped - 64 - 42);
     i += 2;
   }
-  out.resize(static_cast<std::size_t>(o - reinterpret_cast<std::uint8_t*>(out.data())));
+  return static_cast<std::size_t>(o - out);
+}
+
+namespace {
+constexpr yenc_kernels kScalar{decode_yenc_scalar};
+#if defined(__x86_64__) || defined(_M_X64)
+constexpr yenc_kernels kVbmi2{decode_yenc_avx512_vbmi2};
+#endif
+std::atomic<const yenc_kernels*> active_kernels{nullptr};
+}  // namespace
+
+const simd::family_tables<yenc_kernels>& yenc_tables() noexcept {
+  // Built once: whether the AVX-512 level has a kernel depends on VBMI2.
+  static const simd::family_tables<yenc_kernels> tables = [] {
+    simd::family_tables<yenc_kernels> t;
+    t.scalar = &kScalar;
+#if defined(__x86_64__) || defined(_M_X64)
+    if (simd::has_avx512_vbmi2()) t.avx512 = &kVbmi2;
+#endif
+    return t;
+  }();
+  return tables;
+}
+
+}  // namespace detail
+
+std::string decode_yenc(std::string_view in) {
+  std::string out(in.size(), '\0');
+  const std::size_t written = simd::active(detail::yenc_tables(), detail::active_kernels)
+                                  .decode(reinterpret_cast<const std::uint8_t*>(in.data()),
+                                          in.size(), reinterpret_cast<std::uint8_t*>(out.data()));
+  out.resize(written);
   return out;
 }
 

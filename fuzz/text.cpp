@@ -4,7 +4,7 @@
 // Invariants:
 //  1. no crash, no read outside the input (run under the sanitizers);
 //  2. fast paths equal their references: UTF-8 repair, byte classes,
-//     single-byte encoding, the bit-vector edit distance;
+//     single-byte encoding, both distances, the plain number text;
 //  3. repaired text with a well-formed placeholder is well-formed;
 //     decoding then encoding ISO 8859-1 gives the bytes back;
 //  4. the number texts equal what an exact C library prints ("%.Ne" and
@@ -22,7 +22,9 @@
 #include "fuzz/fuzz_check.h"
 #include "search/distance.h"
 #include "tests/reference/char_class_reference.h"
+#include "tests/reference/distance_reference.h"
 #include "tests/reference/latin1_reference.h"
+#include "tests/reference/number_format_reference.h"
 #include "tests/reference/utf8_repair_reference.h"
 #include "text/char_class.h"
 #include "text/latin1.h"
@@ -45,8 +47,12 @@ std::string handle_bytes(const owned_handle& h) {
 void check_repair(std::span<const std::uint8_t> data, std::uint8_t knob) {
   static constexpr std::string_view kPlaceholders[] = {"", "?", "\xEF\xBF\xBD", "\xFF"};
   const std::string_view placeholder = kPlaceholders[knob % 4];
-  const std::string repaired = repair_utf8(data, placeholder);
-  check(repaired == zul::reference::repair_utf8_reference(data, placeholder));
+  const std::string repaired = zul::reference::repair_utf8_reference(data, placeholder);
+  for (const zul::simd::isa level : zul::simd::supported_isas()) {
+    check(repair_utf8(data, placeholder, zul::kMaxResultBytes,
+                      zul::simd::kernels_for(zul::simd::utf8_tables(), level))
+              .view() == repaired);
+  }
   if (knob % 4 != 3) check(well_formed_prefix(bytes_of(repaired)) == repaired.size());
   check(well_formed_prefix(data) <= data.size());
 }
@@ -73,10 +79,20 @@ std::vector<std::uint16_t> units_of(std::string_view bytes) {
 void check_single_byte(std::span<const std::uint8_t> data) {
   const std::vector<std::uint16_t> units =
       units_of({reinterpret_cast<const char*>(data.data()), data.size()});
-  check(handle_bytes(encode_single_byte(units, kISO8859_1)) ==
-        zul::reference::encode_single_byte_reference(units, escapecharsISO8859));
-  check(handle_bytes(encode_single_byte(units, kWindows1252)) ==
-        zul::reference::encode_single_byte_reference(units, escapecharsCP1252));
+  for (const zul::simd::isa level : zul::simd::supported_isas()) {
+    const single_byte_kernels& kernels = zul::simd::kernels_for(single_byte_tables(), level);
+    check(handle_bytes(encode_single_byte(units, kISO8859_1, kHandleLimit, kernels)) ==
+          zul::reference::encode_single_byte_reference(units, escapecharsISO8859));
+    check(handle_bytes(encode_single_byte(units, kWindows1252, kHandleLimit, kernels)) ==
+          zul::reference::encode_single_byte_reference(units, escapecharsCP1252));
+    const std::string decoded =
+        handle_bytes(decode_single_byte(data, kWindows1252, kHandleLimit, kernels));
+    for (std::size_t i = 0; i < data.size(); ++i) {
+      std::uint16_t unit;
+      std::memcpy(&unit, decoded.data() + 2 * i, 2);
+      check(unit == escapecharsCP1252[data[i]]);
+    }
+  }
   const owned_handle wide = decode_single_byte(data, kISO8859_1);
   const std::vector<std::uint16_t> back = units_of(handle_bytes(wide));
   check(handle_bytes(encode_single_byte(back, kISO8859_1)) ==
@@ -86,16 +102,20 @@ void check_single_byte(std::span<const std::uint8_t> data) {
 void check_distances(std::span<const std::uint8_t> data, std::uint8_t knob) {
   // Small alphabets make matches and transpositions likely.
   const std::uint32_t alphabet = 2 + knob % 8;
+  const std::uint32_t base = (knob & 0x40) ? 0x1F600 : 0x60;  // beyond the byte table or not
   std::vector<std::uint32_t> a, b;
   const std::size_t split = data.empty() ? 0 : knob % (data.size() + 1);
   for (std::size_t i = 0; i < data.size(); ++i)
-    (i < split ? a : b).push_back(0x60 + data[i] % alphabet);
+    (i < split ? a : b).push_back(base + data[i] % alphabet);
+  check(zul::search::edit_distance(a, b) == zul::reference::edit_distance_reference(a, b));
   if (!a.empty() && !b.empty()) {
-    check(zul::search::detail::edit_distance_bits(a, b) ==
-          zul::search::detail::edit_distance_rows(a, b));
+    check(zul::search::detail::edit_distance_blocks(a, b) ==
+          zul::reference::edit_distance_reference(a, b));
   }
-  const auto jw = zul::search::jaro_winkler_distance(a, b);
-  check(jw.unallocated_bytes == 0 && jw.value >= 0.0 && jw.value <= 1.0);
+  const double jw = zul::reference::jaro_winkler_distance_reference(a, b);
+  const auto got = zul::search::jaro_winkler_distance(a, b);
+  check(got.unallocated_bytes == 0 && got.value == jw);
+  if (!a.empty() && !b.empty()) check(zul::search::detail::jaro_winkler_lists(a, b).value == jw);
 }
 
 void check_numbers(std::span<const std::uint8_t> data, std::uint8_t knob) {
@@ -109,8 +129,9 @@ void check_numbers(std::span<const std::uint8_t> data, std::uint8_t knob) {
   check(format_scientific(d, digits).view() == want);
   const int precision = knob % 120;
   std::snprintf(want, sizeof want, "%.*f", precision, d);
-  check(detail::format_fixed(d, precision).view() == std::string_view(want).substr(0, 499));
-  check(format_plain(d).size > 0);
+  check(zul::reference::format_fixed_reference(d, precision) ==
+        std::string_view(want).substr(0, 499));
+  check(format_plain(d).view() == zul::reference::format_plain_reference(d));
 }
 
 }  // namespace

@@ -47,12 +47,31 @@ ffi_type* result_ffi_type(ValueType type) {
   }
 }
 
-}  // namespace
+// A ptr argument points at a private copy of its bytes and nothing more, so
+// the integer right after it (its size) may not ask for more bytes than it
+// holds: the callee would read past them. Throws std::invalid_argument.
+void check_ptr_sizes(const Declaration& d, const std::vector<DynamicValue>& args) {
+  for (std::size_t i = 0; i + 1 < args.size(); ++i) {
+    if (args[i].type != ValueType::ptr || args[i + 1].type != ValueType::integer) continue;
+    const std::size_t held = args[i].block.null ? 0 : args[i].block.bytes.size();
+    const std::int64_t size = args[i + 1].integer;
+    if (size > 0 && static_cast<std::uint64_t>(size) > held) {
+      throw std::invalid_argument("argument " + std::to_string(i + 2) + " (" +
+                                  d.params[i + 1].name + "): " + std::to_string(size) +
+                                  " is more than the " + std::to_string(held) +
+                                  (held == 1 ? " byte" : " bytes") + " that argument " +
+                                  std::to_string(i + 1) + " (" + d.params[i].name + ") holds");
+    }
+  }
+}
 
-DynamicValue call_dynamic(Host& host, std::string_view declaration,
-                          const std::vector<DynamicValue>& args) {
-  void* function = host.find(declaration);
-  if (!function) throw std::invalid_argument("not registered: " + std::string(declaration));
+// The parsed declaration, after checking that it is registered and that
+// the arguments have its parameter types. Throws std::invalid_argument.
+Declaration checked_declaration(const Host& host, std::string_view declaration,
+                                const std::vector<DynamicValue>& args) {
+  if (!host.find(declaration)) {
+    throw std::invalid_argument("not registered: " + std::string(declaration));
+  }
   const auto parsed = parse_declaration(declaration);
   if (!parsed) throw std::invalid_argument("cannot parse: " + std::string(declaration));
   if (parsed->params.size() != args.size()) {
@@ -67,64 +86,72 @@ DynamicValue call_dynamic(Host& host, std::string_view declaration,
                                   type_name(args[i].type));
     }
   }
+  check_ptr_sizes(*parsed, args);
+  return *parsed;
+}
 
-  const std::size_t n = args.size();
-  std::vector<ffi_type*> types(n);
-  std::vector<Slot> slots(n);
-  std::vector<void*> values(n);
-  std::vector<std::string> ptr_bytes(n);  // private copies that ptr arguments point at
+// The native arguments of one call: libffi types, the values they point
+// at, private copies for ptr arguments, and the host handles made for them.
+struct NativeArguments {
+  std::vector<ffi_type*> types;
+  std::vector<Slot> slots;
+  std::vector<void*> values;
+  std::vector<std::string> ptr_bytes;
   std::vector<const void*> handles;
+};
 
-  host.call_started();
+void pass_arguments(Host& host, const std::vector<DynamicValue>& args, NativeArguments& native) {
+  const std::size_t n = args.size();
+  native.types.resize(n);
+  native.slots.resize(n);
+  native.values.resize(n);
+  native.ptr_bytes.resize(n);
   for (std::size_t i = 0; i < n; ++i) {
     const DynamicValue& a = args[i];
-    types[i] = argument_ffi_type(a.type);
-    values[i] = &slots[i];
+    Slot& slot = native.slots[i];
+    native.types[i] = argument_ffi_type(a.type);
+    native.values[i] = &slot;
     switch (a.type) {
       case ValueType::string:
-        slots[i].pointer =
+        slot.pointer =
             a.string.null ? nullptr : host.make_string(a.string.bytes, a.string.encoding);
-        handles.push_back(slots[i].pointer);
+        native.handles.push_back(slot.pointer);
         break;
       case ValueType::memory_block:
-        slots[i].pointer = a.block.null ? nullptr : host.make_block(a.block.bytes);
-        handles.push_back(slots[i].pointer);
+        slot.pointer = a.block.null ? nullptr : host.make_block(a.block.bytes);
+        native.handles.push_back(slot.pointer);
         break;
       case ValueType::ptr:
-        ptr_bytes[i] = a.block.bytes;
-        slots[i].pointer = a.block.null ? nullptr : ptr_bytes[i].data();
+        native.ptr_bytes[i] = a.block.bytes;
+        slot.pointer = a.block.null ? nullptr : native.ptr_bytes[i].data();
         break;
       case ValueType::integer:
-        slots[i].integer = a.integer;
+        slot.integer = a.integer;
         break;
       case ValueType::double_:
-        slots[i].real = a.real;
+        slot.real = a.real;
         break;
       case ValueType::boolean:
-        slots[i].boolean = a.boolean ? 1 : 0;
+        slot.boolean = a.boolean ? 1 : 0;
         break;
       default:
         break;
     }
   }
+}
 
-  ffi_cif cif;
-  if (ffi_prep_cif(&cif, FFI_DEFAULT_ABI, static_cast<unsigned>(n), result_ffi_type(parsed->result),
-                   types.data()) != FFI_OK) {
-    host.call_finished(handles);
-    throw std::invalid_argument("libffi cannot describe " + std::string(declaration));
-  }
-  union {
-    ffi_arg small;
-    void* pointer;
-    std::int64_t integer;
-    double real;
-  } raw{};
-  ffi_call(&cif, FFI_FN(function), &raw, values.data());
+union RawResult {
+  ffi_arg small;
+  void* pointer;
+  std::int64_t integer;
+  double real;
+};
 
+// The result as a value; host objects are read and released.
+DynamicValue read_result(Host& host, ValueType type, const RawResult& raw) {
   DynamicValue result;
-  result.type = parsed->result;
-  switch (parsed->result) {
+  result.type = type;
+  switch (type) {
     case ValueType::string: {
       auto s = static_cast<REALstring>(raw.pointer);
       result.string = host.read(s);
@@ -155,7 +182,29 @@ DynamicValue call_dynamic(Host& host, std::string_view declaration,
     default:
       break;
   }
-  host.call_finished(handles);
+  return result;
+}
+
+}  // namespace
+
+DynamicValue call_dynamic(Host& host, std::string_view declaration,
+                          const std::vector<DynamicValue>& args) {
+  const Declaration parsed = checked_declaration(host, declaration, args);
+  void* function = host.find(declaration);
+
+  NativeArguments native;
+  host.call_started();
+  pass_arguments(host, args, native);
+  ffi_cif cif;
+  if (ffi_prep_cif(&cif, FFI_DEFAULT_ABI, static_cast<unsigned>(args.size()),
+                   result_ffi_type(parsed.result), native.types.data()) != FFI_OK) {
+    host.call_finished(native.handles);
+    throw std::invalid_argument("libffi cannot describe " + std::string(declaration));
+  }
+  RawResult raw{};
+  ffi_call(&cif, FFI_FN(function), &raw, native.values.data());
+  DynamicValue result = read_result(host, parsed.result, raw);
+  host.call_finished(native.handles);
   return result;
 }
 

@@ -27,8 +27,6 @@
 
 namespace zul_host {
 
-using namespace text_encoding;
-
 struct HostConfig {
   std::optional<double> version = 2019.0;              // nullopt: no "REALGetRBVersion"
   bool in_runtime = true;                              // answer of "REALinRuntime"
@@ -67,15 +65,15 @@ struct Registration {
 // A host string as tests see it (argument or result).
 struct Str {
   std::string bytes;
-  std::uint32_t encoding = kUTF8;
+  std::uint32_t encoding = text_encoding::kUTF8;
   bool null = false;  // the null string handle
   friend bool operator==(const Str&, const Str&) = default;
 };
-inline Str utf8(std::string_view text) { return {std::string(text), kUTF8, false}; }
+inline Str utf8(std::string_view text) { return {std::string(text), text_encoding::kUTF8, false}; }
 inline Str tagged(std::string_view bytes, std::uint32_t encoding) {
   return {std::string(bytes), encoding, false};
 }
-inline Str null_string() { return {{}, kUTF8, true}; }
+inline Str null_string() { return {{}, text_encoding::kUTF8, true}; }
 
 // A memory block as tests see it.
 struct Block {

@@ -112,17 +112,17 @@ namespace zul_host {
 
 template <class R, class... A>
 R Host::call(std::string_view declaration, const A&... args) {
-  using namespace call_detail;
-  void* function = checked_function(declaration, {argument_type<A>()...}, result_type<R>());
-  using Native = native_result<R> (*)(native_argument<A>...);
+  namespace cd = call_detail;
+  void* function = checked_function(declaration, {cd::argument_type<A>()...}, cd::result_type<R>());
+  using Native = cd::native_result<R> (*)(cd::native_argument<A>...);
   auto native = reinterpret_cast<Native>(function);
 
   call_started();
   std::array<const void*, sizeof...(A) + 1> handles{};
   std::size_t used = 0;
   // Braced initialisation evaluates the arguments left to right.
-  std::tuple<native_argument<A>...> values{to_native(*this, args, handles, used)...};
-  R result = from_native<R>(*this, std::apply(native, values));
+  std::tuple<cd::native_argument<A>...> values{cd::to_native(*this, args, handles, used)...};
+  R result = cd::from_native<R>(*this, std::apply(native, values));
   call_finished(std::span<const void* const>(handles.data(), used));
   return result;
 }

@@ -16,7 +16,6 @@
 #include <string>
 #include <thread>
 #include <unordered_map>
-#include <unordered_set>
 #include <vector>
 
 #include "host/host.h"
@@ -35,7 +34,7 @@ struct HostObject {
   const char* made_by = "";  // the service or API that made it
   // string
   std::string bytes;
-  std::uint32_t encoding = kUnknown;
+  std::uint32_t encoding = text_encoding::kUnknown;
   // memory block
   std::unique_ptr<std::uint8_t[]> data;
   std::int64_t size = 0;
@@ -80,7 +79,6 @@ struct HostState {
   std::vector<ModuleRecord*> module_records;  // owned; freed at destruction
 
   std::unordered_map<const void*, std::unique_ptr<HostObject>> objects;  // live + quarantined
-  std::unordered_set<const HostObject*> live;  // not destroyed: what the ledger scans
   std::deque<HostObject*> quarantine;
   std::uint64_t next_object_id = 1;
 
@@ -126,6 +124,23 @@ void* resolve_service(const char* name);
 
 // The text and array services by lookup name (text_services.cpp), or null.
 void* text_service(std::string_view name);
+
+// One row of a service table. Sig is the signature the plug-in casts the
+// service to (plugin/host_types.h): a function whose signature drifts from
+// it no longer converts, so the table fails to compile.
+struct ServiceEntry {
+  std::string_view name;
+  void* fn;
+};
+template <class Sig>
+ServiceEntry service(std::string_view name, Sig fn) {
+  return {name, reinterpret_cast<void*>(fn)};
+}
+// The same for a pointer handed out by a look-up service.
+template <class Sig>
+void* service_pointer(Sig fn) {
+  return reinterpret_cast<void*>(fn);
+}
 
 // Runs body with the live host locked and the service counted; returns
 // fallback when no Host is live.

@@ -66,7 +66,6 @@ HostObject* HostState::make(Kind kind, const char* made_by) {
   o->thread = std::this_thread::get_id();
   o->made_by = made_by;
   objects.emplace(o, std::move(object));
-  live.insert(o);
   return o;
 }
 
@@ -113,7 +112,6 @@ void HostState::drop_ref(HostObject* o) {
 
 void HostState::destroy(HostObject* o) {
   o->destroyed = true;
-  live.erase(o);
   std::memset(o->bytes.data(), 0xDD, o->bytes.size());
   if (o->size > kPoisonLimit) {
     o->data.reset();

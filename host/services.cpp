@@ -101,7 +101,7 @@ std::int64_t len_b(REALstring s) {
 void* load_global_method(const char* module, const char* declaration) {
   return serve<void*>("REALLoadGlobalMethod", nullptr, [&](HostState&) -> void* {
     if (module || !declaration || std::strcmp(declaration, kLenB) != 0) return nullptr;
-    return reinterpret_cast<void*>(&len_b);
+    return service_pointer<host_sig::LenB>(&len_b);
   });
 }
 
@@ -209,8 +209,9 @@ void* load_object_method(REALobject o, const char* declaration) {
     HostObject* x = h.check(o, "REALLoadObjectMethod");
     if (!x || x->kind != Kind::block || !declaration) return nullptr;
     if (std::strcmp(declaration, kConstructor) == 0)
-      return reinterpret_cast<void*>(&block_constructor);
-    if (std::strcmp(declaration, kToPtr) == 0) return reinterpret_cast<void*>(&block_to_ptr);
+      return service_pointer<host_sig::MemoryBlockConstructor>(&block_constructor);
+    if (std::strcmp(declaration, kToPtr) == 0)
+      return service_pointer<host_sig::MemoryBlockToPtr>(&block_to_ptr);
     return nullptr;
   });
 }
@@ -279,29 +280,29 @@ void* resolve_service(const char* name) {
     if (n == "REALGetRBVersion" && !h->config.version) return nullptr;
     if (h->config.null_first.count(n) && it->second == 1) return nullptr;
   }
-  static const std::pair<std::string_view, void*> kServices[] = {
-      {"REALGetRBVersion", reinterpret_cast<void*>(&get_rb_version)},
-      {"RegisterPluginVersion", reinterpret_cast<void*>(&register_plugin_version)},
-      {"REALinRuntime", reinterpret_cast<void*>(&in_runtime)},
-      {"PluginRegisterModule", reinterpret_cast<void*>(&register_module)},
-      {"PluginRegisterMethod", reinterpret_cast<void*>(&register_method)},
-      {"REALLockString", reinterpret_cast<void*>(&lock_string)},
-      {"REALUnlockString", reinterpret_cast<void*>(&unlock_string)},
-      {"StringGetCString", reinterpret_cast<void*>(&string_get_cstring)},
-      {"REALLoadGlobalMethod", reinterpret_cast<void*>(&load_global_method)},
-      {"REALLockObject", reinterpret_cast<void*>(&lock_object)},
-      {"REALUnlockObject", reinterpret_cast<void*>(&unlock_object)},
-      {"REALGetPropValueInteger", reinterpret_cast<void*>(&get_prop_integer)},
-      {"memoryBlockGetSize", reinterpret_cast<void*>(&block_get_size)},
-      {"memoryBlockGetPtr", reinterpret_cast<void*>(&block_get_ptr)},
-      {"newMemoryBlock", reinterpret_cast<void*>(&new_memory_block)},
-      {"REALLoadObjectMethod", reinterpret_cast<void*>(&load_object_method)},
-      {"PluginNewInstance", reinterpret_cast<void*>(&new_instance)},
-      {"PluginCallFunctionWithExceptionHandler",
-       reinterpret_cast<void*>(&call_with_exception_handler)},
-      {"REALSetPropValueString", reinterpret_cast<void*>(&set_prop_string)},
-      {"REALSetPropValueInteger", reinterpret_cast<void*>(&set_prop_integer)},
-      {"RuntimeRaiseException", reinterpret_cast<void*>(&raise_exception)},
+  static const ServiceEntry kServices[] = {
+      service<host_sig::GetRBVersion>("REALGetRBVersion", &get_rb_version),
+      service<host_sig::RegisterPluginVersion>("RegisterPluginVersion", &register_plugin_version),
+      service<host_sig::InRuntime>("REALinRuntime", &in_runtime),
+      service<host_sig::RegisterModule>("PluginRegisterModule", &register_module),
+      service<host_sig::RegisterMethod>("PluginRegisterMethod", &register_method),
+      service<host_sig::LockString>("REALLockString", &lock_string),
+      service<host_sig::LockString>("REALUnlockString", &unlock_string),
+      service<host_sig::StringGetCString>("StringGetCString", &string_get_cstring),
+      service<host_sig::LoadGlobalMethod>("REALLoadGlobalMethod", &load_global_method),
+      service<host_sig::LockObject>("REALLockObject", &lock_object),
+      service<host_sig::LockObject>("REALUnlockObject", &unlock_object),
+      service<host_sig::GetPropValueInteger>("REALGetPropValueInteger", &get_prop_integer),
+      service<host_sig::MemoryBlockGetSize>("memoryBlockGetSize", &block_get_size),
+      service<host_sig::MemoryBlockGetPtr>("memoryBlockGetPtr", &block_get_ptr),
+      service<host_sig::NewMemoryBlock>("newMemoryBlock", &new_memory_block),
+      service<host_sig::LoadObjectMethod>("REALLoadObjectMethod", &load_object_method),
+      service<host_sig::NewInstance>("PluginNewInstance", &new_instance),
+      service<host_sig::CallWithExceptionHandler>("PluginCallFunctionWithExceptionHandler",
+                                                  &call_with_exception_handler),
+      service<host_sig::SetPropValueString>("REALSetPropValueString", &set_prop_string),
+      service<host_sig::SetPropValueInteger>("REALSetPropValueInteger", &set_prop_integer),
+      service<host_sig::RaiseException>("RuntimeRaiseException", &raise_exception),
   };
   for (const auto& [service, fn] : kServices) {
     if (service == n) return fn;

@@ -9,6 +9,9 @@
 #include "host/text_convert.h"
 
 namespace zul_host::detail {
+
+using namespace text_encoding;
+
 namespace {
 
 constexpr std::uint8_t kFiller = 0xA5;
@@ -167,17 +170,19 @@ host_sig::StringArrayInsert string_array_insert_proc(REALarray a) {
 }  // namespace
 
 void* text_service(std::string_view name) {
-  static const std::pair<std::string_view, void*> kServices[] = {
-      {"REALBuildString", reinterpret_cast<void*>(&build_string)},
-      {"REALBuildStringWithEncoding", reinterpret_cast<void*>(&build_string_with_encoding)},
-      {"REALSetStringEncoding", reinterpret_cast<void*>(&set_string_encoding)},
-      {"REALConvertString", reinterpret_cast<void*>(&convert_string)},
-      {"REALGetStringEncoding", reinterpret_cast<void*>(&get_string_encoding)},
-      {"PluginGetStringData", reinterpret_cast<void*>(&get_string_data)},
-      {"PluginDisposeStringData", reinterpret_cast<void*>(&dispose_string_data)},
-      {"RuntimeArrayCreateSingleDimBoundedArray", reinterpret_cast<void*>(&create_array)},
-      {"RuntimeUBound", reinterpret_cast<void*>(&array_ubound)},
-      {"PluginStringArrayInsertProc", reinterpret_cast<void*>(&string_array_insert_proc)},
+  static const ServiceEntry kServices[] = {
+      service<host_sig::BuildString>("REALBuildString", &build_string),
+      service<host_sig::BuildStringWithEncoding>("REALBuildStringWithEncoding",
+                                                 &build_string_with_encoding),
+      service<host_sig::SetStringEncoding>("REALSetStringEncoding", &set_string_encoding),
+      service<host_sig::ConvertString>("REALConvertString", &convert_string),
+      service<host_sig::GetStringEncoding>("REALGetStringEncoding", &get_string_encoding),
+      service<host_sig::GetStringData>("PluginGetStringData", &get_string_data),
+      service<host_sig::DisposeStringData>("PluginDisposeStringData", &dispose_string_data),
+      service<host_sig::CreateArray>("RuntimeArrayCreateSingleDimBoundedArray", &create_array),
+      service<host_sig::ArrayUBound>("RuntimeUBound", &array_ubound),
+      service<host_sig::StringArrayInsertProc>("PluginStringArrayInsertProc",
+                                               &string_array_insert_proc),
   };
   for (const auto& [service, fn] : kServices) {
     if (service == name) return fn;

@@ -7,18 +7,24 @@
 #include <cerrno>
 #include <charconv>
 #include <cstdlib>
+#include <filesystem>
 #include <fstream>
 #include <iterator>
 #include <stdexcept>
 
+#include "common/hex_digits.h"
 #include "host/text_convert.h"
 
 namespace zul_host {
+
+using namespace text_encoding;
+
 namespace {
 
 constexpr std::string_view kUsage =
     "usage: zul [--plugin PATH] [--host-version V|none] [--verbose] list\n"
     "       zul [--plugin PATH] [--host-version V|none] [--verbose] call NAME ARG...\n"
+    "options may stand anywhere; after a lone -- every word is an argument\n"
     "string, memoryblock and ptr arguments: TEXT, hex:C3A9, file:PATH, @null,\n"
     "  or utf8: utf16: utf32: latin1: cp1252: macroman: ascii: followed by TEXT\n";
 
@@ -34,16 +40,52 @@ constexpr Prefix kPrefixes[] = {
 
 bool starts_with(std::string_view s, std::string_view p) { return s.substr(0, p.size()) == p; }
 
+// What is wrong with the digits of a "hex:" form, or "".
+std::string hex_problem(std::string_view hex) {
+  std::string problem;
+  for (std::size_t i = 0; i < hex.size() && problem.empty(); ++i) {
+    if (zul::is_hex_digit(hex[i])) continue;
+    problem.append("'").append(1, hex[i]).append("' at position ");
+    problem.append(std::to_string(i + 1)).append(" of the digits is not a hex digit");
+  }
+  if (problem.empty() && hex.size() % 2) {
+    problem.append("an odd number of hex digits (").append(std::to_string(hex.size())).append(")");
+  }
+  return problem;
+}
+
 std::optional<std::string> from_hex(std::string_view hex) {
-  if (hex.size() % 2) return std::nullopt;
+  if (!hex_problem(hex).empty()) return std::nullopt;
   std::string out;
   for (std::size_t i = 0; i < hex.size(); i += 2) {
-    unsigned value = 0;
-    const auto [end, ec] = std::from_chars(hex.data() + i, hex.data() + i + 2, value, 16);
-    if (ec != std::errc() || end != hex.data() + i + 2) return std::nullopt;
-    out += static_cast<char>(value);
+    out += static_cast<char>(zul::hex_value(hex[i]) << 4 | zul::hex_value(hex[i + 1]));
   }
   return out;
+}
+
+// What keeps the file at path from being read as an argument, or "".
+std::string file_problem(const std::string& path) {
+  std::error_code ec;
+  const auto status = std::filesystem::status(path, ec);
+  if (ec || !std::filesystem::exists(status)) return "no such file";
+  if (std::filesystem::is_directory(status)) return "is a directory, not a file";
+  if (!std::filesystem::is_regular_file(status)) return "is not a regular file";
+  return "";
+}
+
+// The bytes of a regular file; nullopt when it cannot be read. Reading a
+// directory or a vanishing file makes the stream throw: that is caught.
+std::optional<std::string> read_file(const std::string& path) {
+  if (!file_problem(path).empty()) return std::nullopt;
+  try {
+    std::ifstream in(path, std::ios::binary);
+    if (!in) return std::nullopt;
+    std::string bytes((std::istreambuf_iterator<char>(in)), std::istreambuf_iterator<char>());
+    if (in.bad()) return std::nullopt;
+    return bytes;
+  } catch (const std::exception&) {
+    return std::nullopt;
+  }
 }
 
 // Bytes and encoding for the string-like forms.
@@ -55,11 +97,9 @@ std::optional<Str> parse_bytes(std::string_view text) {
     return tagged(*bytes, kUnknown);
   }
   if (starts_with(text, "file:")) {
-    std::ifstream in(std::string(text.substr(5)), std::ios::binary);
-    if (!in) return std::nullopt;
-    return tagged(
-        std::string((std::istreambuf_iterator<char>(in)), std::istreambuf_iterator<char>()),
-        kUnknown);
+    auto bytes = read_file(std::string(text.substr(5)));
+    if (!bytes) return std::nullopt;
+    return tagged(std::move(*bytes), kUnknown);
   }
   for (const Prefix& p : kPrefixes) {
     if (starts_with(text, p.prefix)) {
@@ -98,11 +138,10 @@ bool printable_utf8(std::string_view s) {
 }
 
 std::string to_hex(std::string_view bytes) {
-  static constexpr char kDigits[] = "0123456789ABCDEF";
   std::string out;
   for (unsigned char c : bytes) {
-    out += kDigits[c >> 4];
-    out += kDigits[c & 15];
+    out += zul::kHexDigits[c >> 4];
+    out += zul::kHexDigits[c & 15];
   }
   return out;
 }
@@ -122,6 +161,15 @@ std::string format_bytes(std::string_view bytes, std::uint32_t encoding, bool* a
 }
 
 }  // namespace
+
+std::string argument_problem(std::string_view text) {
+  if (starts_with(text, "hex:")) return hex_problem(text.substr(4));
+  if (starts_with(text, "file:")) {
+    const std::string path(text.substr(5));
+    return file_problem(path);
+  }
+  return "";
+}
 
 std::optional<DynamicValue> parse_argument(ValueType type, std::string_view text) {
   DynamicValue v;
@@ -232,80 +280,103 @@ std::string format_value(const DynamicValue& value, bool* as_hex) {
   return "";
 }
 
-int run_zul(const std::vector<std::string>& args, const std::string& default_plugin,
-            std::ostream& out, std::ostream& err) {
-  std::string plugin = default_plugin;
+namespace {
+
+// What the command line asks for once its options are read.
+struct CommandLine {
+  std::string plugin;
   HostConfig config;
   bool verbose = false;
-  std::size_t i = 0;
-  for (; i < args.size() && starts_with(args[i], "--"); ++i) {
-    const std::string& option = args[i];
-    if (option == "--verbose") {
-      verbose = true;
-    } else if (option == "--plugin" && i + 1 < args.size()) {
-      plugin = args[++i];
-    } else if (option == "--host-version" && i + 1 < args.size()) {
-      const std::string& v = args[++i];
-      if (v == "none") {
-        config.version.reset();
-      } else if (auto parsed = parse_argument(ValueType::double_, v)) {
-        config.version = parsed->real;
-      } else {
-        err << "zul: --host-version wants a number or none, not '" << v << "'\n" << kUsage;
-        return 2;
-      }
+  std::vector<std::string> words;  // the sub-command, then its arguments
+};
+
+// Reads the option at args[i] (advancing i past its value); false after
+// reporting an unknown or incomplete one.
+bool read_option(const std::vector<std::string>& args, std::size_t& i, CommandLine& line,
+                 std::ostream& err) {
+  const std::string& option = args[i];
+  const bool has_value = i + 1 < args.size();
+  if (option == "--verbose") {
+    line.verbose = true;
+  } else if (option == "--plugin" && has_value) {
+    line.plugin = args[++i];
+  } else if (option == "--host-version" && has_value) {
+    const std::string& v = args[++i];
+    if (v == "none") {
+      line.config.version.reset();
+    } else if (auto parsed = parse_argument(ValueType::double_, v)) {
+      line.config.version = parsed->real;
     } else {
-      err << "zul: unknown or incomplete option '" << option << "'\n" << kUsage;
-      return 2;
+      err << "zul: --host-version wants a number or none, not '" << v << "'\n" << kUsage;
+      return false;
+    }
+  } else {
+    err << "zul: unknown or incomplete option '" << option << "'\n" << kUsage;
+    return false;
+  }
+  return true;
+}
+
+// Options may stand anywhere, before or after the sub-command and between
+// its arguments, as users type them; a lone "--" ends them, so that later
+// words starting with "--" are arguments.
+bool read_command_line(const std::vector<std::string>& args, CommandLine& line, std::ostream& err) {
+  bool options_ended = false;
+  for (std::size_t i = 0; i < args.size(); ++i) {
+    if (!options_ended && args[i] == "--") {
+      options_ended = true;
+    } else if (!options_ended && starts_with(args[i], "--")) {
+      if (!read_option(args, i, line, err)) return false;
+    } else {
+      line.words.push_back(args[i]);
     }
   }
-  if (i >= args.size() || (args[i] != "list" && args[i] != "call") ||
-      (args[i] == "call" && i + 1 >= args.size())) {
+  const std::vector<std::string>& w = line.words;
+  if (w.empty() || (w[0] != "list" && w[0] != "call") || (w[0] == "call" && w.size() < 2)) {
     err << kUsage;
-    return 2;
+    return false;
   }
+  return true;
+}
 
-  Host host(config);
-  try {
-    host.load(plugin);
-  } catch (const std::exception& e) {
-    err << "zul: " << e.what() << "\n";
-    return 3;
+// Why args do not fit d: the first argument that is missing, extra or not
+// of its parameter's type.
+std::string mismatch(const Declaration& d, const std::vector<std::string>& args) {
+  if (args.size() > d.params.size()) {
+    return "takes " + std::to_string(d.params.size()) + " arguments, given " +
+           std::to_string(args.size());
   }
-  const Registration& registration = host.registration();
-  if (args[i] == "list") {
-    for (const RegisteredMethod& m : registration.methods) out << m.declaration << "\n";
-    return 0;
-  }
-
-  const std::string& name = args[i + 1];
-  const std::vector<std::string> call_args(args.begin() + static_cast<std::ptrdiff_t>(i) + 2,
-                                           args.end());
-  std::vector<DynamicValue> values;
-  const auto declaration = choose_overload(registration, name, call_args, values);
-  if (!declaration) {
-    std::vector<std::string> candidates;
-    for (const RegisteredMethod& m : registration.methods) {
-      const auto d = parse_declaration(m.declaration);
-      if (d && d->name == name) candidates.push_back(m.declaration);
+  for (std::size_t i = 0; i < d.params.size(); ++i) {
+    const Parameter& p = d.params[i];
+    const std::string which = "argument " + std::to_string(i + 1) + " (" + p.name + ")";
+    if (i >= args.size()) {
+      if (!p.default_value) return which + " is missing";
+      continue;
     }
-    if (candidates.empty()) {
-      err << "zul: no function named " << name << " (see zul list)\n";
-    } else {
-      err << "zul: these arguments fit no overload of " << name << ":\n";
-      for (const std::string& c : candidates) err << "  " << c << "\n";
+    if (!parse_argument(p.type, args[i])) {
+      return which + ": '" + args[i] + "' is not a valid " + type_name(p.type);
     }
-    return 2;
   }
+  return "";
+}
 
-  DynamicValue result;
-  try {
-    result = call_dynamic(host, *declaration, values);
-  } catch (const std::exception& e) {
-    err << "zul: " << e.what() << "\n";
-    return 2;
+void report_no_overload(const Registration& registration, const std::string& name,
+                        const std::vector<std::string>& args, std::ostream& err) {
+  bool any = false;
+  for (const RegisteredMethod& m : registration.methods) {
+    const auto d = parse_declaration(m.declaration);
+    if (!d || d->name != name) continue;
+    if (!any) err << "zul: these arguments fit no overload of " << name << ":\n";
+    any = true;
+    err << "  " << m.declaration << "\n    " << mismatch(*d, args) << "\n";
   }
-  if (verbose) err << "zul: called " << *declaration << "\n";
+  if (!any) err << "zul: no function named " << name << " (see zul list)\n";
+}
+
+// Prints the result (and, when asked or when it is hex, what it is) and
+// checks the ledger. Returns the exit status.
+int report_result(const Host& host, const DynamicValue& result, bool verbose, std::ostream& out,
+                  std::ostream& err) {
   if (const auto& raised = host.last_exception()) {
     err << raised->class_name << ": " << raised->message << "\n";
     return 1;
@@ -324,6 +395,55 @@ int run_zul(const std::vector<std::string>& args, const std::string& default_plu
     return 3;
   }
   return 0;
+}
+
+int call_by_name(Host& host, const std::string& name, const std::vector<std::string>& args,
+                 bool verbose, std::ostream& out, std::ostream& err) {
+  // A broken hex: or file: form is wrong whatever the overload.
+  for (std::size_t i = 0; i < args.size(); ++i) {
+    if (const std::string problem = argument_problem(args[i]); !problem.empty()) {
+      err << "zul: argument " << i + 1 << " (" << args[i] << "): " << problem << "\n";
+      return 2;
+    }
+  }
+  std::vector<DynamicValue> values;
+  const auto declaration = choose_overload(host.registration(), name, args, values);
+  if (!declaration) {
+    report_no_overload(host.registration(), name, args, err);
+    return 2;
+  }
+  DynamicValue result;
+  try {
+    result = call_dynamic(host, *declaration, values);
+  } catch (const std::exception& e) {
+    err << "zul: " << e.what() << "\n";
+    return 2;
+  }
+  if (verbose) err << "zul: called " << *declaration << "\n";
+  return report_result(host, result, verbose, out, err);
+}
+
+}  // namespace
+
+int run_zul(const std::vector<std::string>& args, const std::string& default_plugin,
+            std::ostream& out, std::ostream& err) {
+  CommandLine line;
+  line.plugin = default_plugin;
+  if (!read_command_line(args, line, err)) return 2;
+
+  Host host(line.config);
+  try {
+    host.load(line.plugin);
+  } catch (const std::exception& e) {
+    err << "zul: " << e.what() << "\n";
+    return 3;
+  }
+  if (line.words[0] == "list") {
+    for (const RegisteredMethod& m : host.registration().methods) out << m.declaration << "\n";
+    return 0;
+  }
+  const std::vector<std::string> call_args(line.words.begin() + 2, line.words.end());
+  return call_by_name(host, line.words[1], call_args, line.verbose, out, err);
 }
 
 }  // namespace zul_host

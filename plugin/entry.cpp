@@ -33,7 +33,8 @@ int interface_version_for(double version) {
 }
 
 // Copies the table into one heap record. The record, its name and its rows
-// belong to the host from then on and are never freed here.
+// belong to the host from then on and are never freed here. When any of the
+// three cannot be allocated nothing is registered.
 void register_module() {
   char name[100] = {};
   std::snprintf(name, sizeof name, "%s%s", gpartname, kModuleSuffix);
@@ -45,12 +46,17 @@ void register_module() {
     std::free(record);
     return;
   }
+  record->name = strdup(name);
+  if (!record->name) {
+    std::free(rows);
+    std::free(record);
+    return;
+  }
   for (std::size_t i = 0; i < globalMethodCount; ++i) {
     rows[i] = globalMethods[i];
     rows[i].flags |= kModuleFlag;
     rows[i].zero = 0;
   }
-  record->name = strdup(name);
   record->methods = rows;
   record->method_count = globalMethodCount;
   record->interface_version = static_cast<std::uint32_t>(CurrentREALControlVersion);

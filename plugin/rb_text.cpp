@@ -96,9 +96,15 @@ void rbText::reset_slot(Slot slot) {
 }
 
 bool rbText::take_copy(Slot slot, const void* src, std::size_t units, std::size_t unit) {
-  // Zero-filled with room for a terminating zero unit (and then some).
-  void* buffer = std::calloc(units * unit + 4 * unit, 1);
   reset_slot(slot);
+  // units comes from a length the host reports: a count whose buffer (with
+  // four spare units) has no size, or that a signed length cannot hold, is
+  // a failed allocation.
+  void* buffer = nullptr;
+  if (units <= SIZE_MAX / unit - 4 && units <= static_cast<std::uint64_t>(INT64_MAX)) {
+    // Zero-filled with room for a terminating zero unit (and then some).
+    buffer = std::calloc(units + 4, unit);
+  }
   if (!buffer) {
     out_of_memory_ = true;
     return false;
@@ -216,6 +222,7 @@ void rbText::derive_utf32_from_utf16() {
   reset_slot(kUTF32);
   const std::int64_t n = lengths_[kUTF16];
   if (n < 1) return;
+  // n is at most the UTF-16 slot's unit count, which take_copy bounded.
   auto* out = static_cast<std::uint32_t*>(std::calloc(static_cast<std::size_t>(n) + 4, 4));
   if (!out) {
     out_of_memory_ = true;

@@ -44,6 +44,8 @@ class rbText {
   }
 
   bool is_ascii() const { return is_ascii_; }
+  // True when the host could not give the text in a form asked for (the
+  // form then reads as empty text).
   bool host_failed() const { return host_failed_; }
   // True once a form could not be copied or widened for want of memory (it
   // then reads as empty text): for callers that report failed allocations.

@@ -40,24 +40,24 @@ double distance_between(REALstring a, REALstring b, double failed, Distance dist
 
 }  // namespace
 
-int64_t CountOccurancesZUL(REALstring s, REALstring find) noexcept {
-  return quietly<int64_t>(0, [&] {
+std::int64_t CountOccurancesZUL(REALstring s, REALstring find) noexcept {
+  return quietly<std::int64_t>(0, [&] {
     rbData hs(s);
     rbData hf(find);
     return zul::search::count_occurrences(hs.bytes(), hf.bytes());
   });
 }
 
-int64_t StrCompBytesZUL(REALstring a, REALstring b) noexcept {
-  return quietly<int64_t>(0, [&] {
+std::int64_t StrCompBytesZUL(REALstring a, REALstring b) noexcept {
+  return quietly<std::int64_t>(0, [&] {
     rbData ha(a);
     rbData hb(b);
     return zul::search::compare_bytes(ha.bytes(), hb.bytes());
   });
 }
 
-int64_t StrCompCharsZUL(REALstring a, REALstring b) noexcept {
-  return trapped<int64_t>(0, [&]() -> int64_t {
+std::int64_t StrCompCharsZUL(REALstring a, REALstring b) noexcept {
+  return trapped<std::int64_t>(0, [&]() -> std::int64_t {
     {
       rbData ha(a);
       rbData hb(b);

@@ -1,38 +1,24 @@
-// Counting and byte ordering. The counting jumps from one candidate start to
-// the next with memchr on the first byte of the pattern and checks the rest
-// with memcmp: still one forward scan, but the C library's vectorised loops
-// do the skipping. The ordering compares the common prefix with memcmp and
-// then only asks whether the longer tail holds a non-zero byte.
+// Counting and byte ordering. The counting runs the machine's counting
+// kernels (search/count_kernels.h): 8-bit lane counters for one byte, a
+// first- and last-byte filter then a full check for longer patterns. The
+// ordering compares the common prefix with memcmp and then only asks
+// whether the longer tail holds a non-zero byte.
 #include "search/count_compare.h"
 
 #include <algorithm>
 #include <cstring>
 
+#include "search/count_kernels.h"
+
 namespace zul::search {
 
 std::int64_t count_occurrences(bytes_view s, bytes_view find) noexcept {
-  const std::size_t n = s.size();
-  const std::size_t m = find.size();
-  if (m == 0 || n == 0 || m > n) return 0;
-  const std::uint8_t* p = s.data();
-  if (m == 1) {
-    return static_cast<std::int64_t>(std::count(s.begin(), s.end(), find[0]));
-  }
-  const std::uint8_t* const last = p + (n - m);  // last candidate start
-  const std::uint8_t first = find[0];
-  std::int64_t count = 0;
-  while (p <= last) {
-    const void* hit = std::memchr(p, first, static_cast<std::size_t>(last - p) + 1);
-    if (!hit) break;
-    p = static_cast<const std::uint8_t*>(hit);
-    if (std::memcmp(p + 1, find.data() + 1, m - 1) == 0) {
-      ++count;
-      p += m;
-    } else {
-      ++p;
-    }
-  }
-  return count;
+  if (find.empty() || s.empty() || find.size() > s.size()) return 0;
+  const detail::count_kernels& k = detail::active_count_kernels();
+  const std::uint64_t count = find.size() == 1
+                                  ? k.count_byte(s.data(), s.size(), find[0])
+                                  : k.count_pattern(s.data(), s.size(), find.data(), find.size());
+  return static_cast<std::int64_t>(count);
 }
 
 int compare_bytes(bytes_view a, bytes_view b) noexcept {

@@ -21,16 +21,18 @@ struct distance_result {
 };
 
 // 1.0 minus the Jaro-Winkler similarity of a and b: 0.0 for equal texts and
-// for two empty texts, 1.0 when one text is empty or nothing matches. Uses
-// la + lb bytes of flags; when the flags of a (la bytes) or of b (lb bytes)
-// cannot be allocated the result is 0.0 with that byte count.
+// for two empty texts, 1.0 when one text is empty or nothing matches. For
+// each character of a in order, the first unmatched equal character of b
+// within the window floor(max(la, lb) / 2) - 1 is its match. Nothing is
+// allocated when b has at most 64 characters; otherwise about 12 bytes per
+// character of b, and when that fails the result is 0.0 with the byte count.
 distance_result jaro_winkler_distance(code_points a, code_points b) noexcept;
 
 // The restricted edit distance d of a and b (insertions, deletions,
 // substitutions and swaps of two adjacent characters, each costing 1, no
 // character edited twice), or nothing when the work buffer of
 // edit_distance_work_bytes(a.size(), b.size()) bytes cannot be allocated.
-// Memory grows with the shorter text only.
+// Nothing is allocated when the shorter text has at most 64 characters.
 std::optional<std::int64_t> edit_distance(code_points a, code_points b) noexcept;
 std::int64_t edit_distance_work_bytes(std::size_t la, std::size_t lb) noexcept;
 
@@ -41,12 +43,19 @@ std::int64_t edit_distance_work_bytes(std::size_t la, std::size_t lb) noexcept;
 distance_result levenshtein_distance(code_points a, code_points b) noexcept;
 
 namespace detail {
-// Row-by-row dynamic programme over three rows of min(la, lb) + 1 cells; the
-// reference for the bit-vector version. Throws std::bad_alloc.
-std::int64_t edit_distance_rows(code_points a, code_points b);
+// The edit distance with the whole pattern (1 to 64 characters) in one
+// machine word; the text may have any length. No allocation.
+std::int64_t edit_distance_word(code_points pattern, code_points text) noexcept;
 // Bit-vector version, 64 pattern characters per step, one byte of state per
 // text character; both texts non-empty. Throws std::bad_alloc.
-std::int64_t edit_distance_bits(code_points pattern, code_points text);
+std::int64_t edit_distance_blocks(code_points pattern, code_points text);
+
+// The two matchers behind jaro_winkler_distance, both texts non-empty: the
+// one-word version for b of at most 64 characters, and the version over
+// per-character position lists for any length (0.0 with the byte count when
+// its work memory cannot be allocated).
+distance_result jaro_winkler_word(code_points a, code_points b) noexcept;
+distance_result jaro_winkler_lists(code_points a, code_points b) noexcept;
 }  // namespace detail
 
 }  // namespace zul::search

@@ -9,43 +9,44 @@
 
 using zul::search::byte_range;
 
-int64_t InStrBytesZUL(REALstring target, REALstring find) noexcept {
-  return quietly<int64_t>(0, [&] {
+std::int64_t InStrBytesZUL(REALstring target, REALstring find) noexcept {
+  return quietly<std::int64_t>(0, [&] {
     rbData t(target);
     rbData f(find);
     return zul::search::find_first_of(t.bytes(), f.bytes());
   });
 }
 
-int64_t InStrByteRange1ZUL(REALstring target, int64_t start, int64_t end) noexcept {
-  return quietly<int64_t>(0, [&] {
+std::int64_t InStrByteRange1ZUL(REALstring target, std::int64_t start, std::int64_t end) noexcept {
+  return quietly<std::int64_t>(0, [&] {
     rbData t(target);
     const byte_range ranges[] = {{start, end}};
     return zul::search::find_in_ranges(t.bytes(), ranges);
   });
 }
 
-int64_t InStrByteRange2ZUL(REALstring target, int64_t start, int64_t end, int64_t start2,
-                           int64_t end2) noexcept {
-  return quietly<int64_t>(0, [&] {
+std::int64_t InStrByteRange2ZUL(REALstring target, std::int64_t start, std::int64_t end,
+                                std::int64_t start2, std::int64_t end2) noexcept {
+  return quietly<std::int64_t>(0, [&] {
     rbData t(target);
     const byte_range ranges[] = {{start, end}, {start2, end2}};
     return zul::search::find_in_ranges(t.bytes(), ranges);
   });
 }
 
-int64_t InStrByteRange3ZUL(REALstring target, int64_t start, int64_t end, int64_t start2,
-                           int64_t end2, int64_t start3, int64_t end3) noexcept {
-  return quietly<int64_t>(0, [&] {
+std::int64_t InStrByteRange3ZUL(REALstring target, std::int64_t start, std::int64_t end,
+                                std::int64_t start2, std::int64_t end2, std::int64_t start3,
+                                std::int64_t end3) noexcept {
+  return quietly<std::int64_t>(0, [&] {
     rbData t(target);
     const byte_range ranges[] = {{start, end}, {start2, end2}, {start3, end3}};
     return zul::search::find_in_ranges(t.bytes(), ranges);
   });
 }
 
-int64_t InStrByteRange1BZUL(REALstring target, REALstring find, int64_t start,
-                            int64_t end) noexcept {
-  return quietly<int64_t>(0, [&] {
+std::int64_t InStrByteRange1BZUL(REALstring target, REALstring find, std::int64_t start,
+                                 std::int64_t end) noexcept {
+  return quietly<std::int64_t>(0, [&] {
     rbData t(target);
     rbData f(find);
     const byte_range ranges[] = {{start, end}};
@@ -53,9 +54,10 @@ int64_t InStrByteRange1BZUL(REALstring target, REALstring find, int64_t start,
   });
 }
 
-int64_t InStrByteRange2BZUL(REALstring target, REALstring find, int64_t start, int64_t end,
-                            int64_t start2, int64_t end2) noexcept {
-  return quietly<int64_t>(0, [&] {
+std::int64_t InStrByteRange2BZUL(REALstring target, REALstring find, std::int64_t start,
+                                 std::int64_t end, std::int64_t start2,
+                                 std::int64_t end2) noexcept {
+  return quietly<std::int64_t>(0, [&] {
     rbData t(target);
     rbData f(find);
     const byte_range ranges[] = {{start, end}, {start2, end2}};
@@ -63,9 +65,10 @@ int64_t InStrByteRange2BZUL(REALstring target, REALstring find, int64_t start, i
   });
 }
 
-int64_t InStrByteRange3BZUL(REALstring target, REALstring find, int64_t start, int64_t end,
-                            int64_t start2, int64_t end2, int64_t start3, int64_t end3) noexcept {
-  return quietly<int64_t>(0, [&] {
+std::int64_t InStrByteRange3BZUL(REALstring target, REALstring find, std::int64_t start,
+                                 std::int64_t end, std::int64_t start2, std::int64_t end2,
+                                 std::int64_t start3, std::int64_t end3) noexcept {
+  return quietly<std::int64_t>(0, [&] {
     rbData t(target);
     rbData f(find);
     const byte_range ranges[] = {{start, end}, {start2, end2}, {start3, end3}};

@@ -9,6 +9,8 @@
 
 namespace {
 
+using namespace text_encoding;
+
 using zul_host::Str;
 using zul_host::tagged;
 using zul_host::utf8;
@@ -50,10 +52,11 @@ TEST_F(ByteSearch, first_of_set) {
       {utf8("abc"), zul_host::null_string(), 0, "null find"},
       {zul_host::null_string(), utf8("a"), 0, "null target"},
       {utf8(""), utf8("a"), 0, "empty target"},
-      {tagged(std::string("a\0b", 3), zul_host::kUnknown),
-       tagged(std::string(1, '\0'), zul_host::kUnknown), 2, "NUL inside a string"},
-      {utf8("caf\xC3\xA9"), tagged("\xE9", zul_host::kLatin1), 0, "bytes as stored, no conversion"},
-      {tagged(std::string("\x00\x41", 2), zul_host::kUTF16), utf8("A"), 2,
+      {tagged(std::string("a\0b", 3), text_encoding::kUnknown),
+       tagged(std::string(1, '\0'), text_encoding::kUnknown), 2, "NUL inside a string"},
+      {utf8("caf\xC3\xA9"), tagged("\xE9", text_encoding::kLatin1), 0,
+       "bytes as stored, no conversion"},
+      {tagged(std::string("\x00\x41", 2), text_encoding::kUTF16), utf8("A"), 2,
        "UTF-16 bytes as stored"},
   };
   for (const auto& row : rows) {
@@ -63,7 +66,7 @@ TEST_F(ByteSearch, first_of_set) {
 }
 
 TEST_F(ByteSearch, ranges_without_find_read_bytes_unsigned) {
-  const Str c3 = tagged("\xC3\xA9", zul_host::kUnknown);
+  const Str c3 = tagged("\xC3\xA9", text_encoding::kUnknown);
   EXPECT_EQ(call<std::int64_t>(kRange1, utf8("ab7c1"), std::int64_t{48}, std::int64_t{57}), 3);
   EXPECT_EQ(call<std::int64_t>(kRange1, utf8("ab7c1"), std::int64_t{57}, std::int64_t{48}), 0);
   EXPECT_EQ(call<std::int64_t>(kRange1, c3, std::int64_t{128}, std::int64_t{255}), 1);
@@ -80,7 +83,7 @@ TEST_F(ByteSearch, ranges_without_find_read_bytes_unsigned) {
 }
 
 TEST_F(ByteSearch, ranges_with_find_read_bytes_signed) {
-  const Str c3 = tagged("\xC3\xA9", zul_host::kUnknown);
+  const Str c3 = tagged("\xC3\xA9", text_encoding::kUnknown);
   const Str empty = utf8("");
   EXPECT_EQ(call<std::int64_t>(kRange1B, c3, empty, std::int64_t{128}, std::int64_t{255}), 0);
   EXPECT_EQ(call<std::int64_t>(kRange1B, c3, empty, std::int64_t{-128}, std::int64_t{-1}), 1);
@@ -104,7 +107,7 @@ TEST_F(ByteSearch, same_handle_as_both_arguments) {
   auto fn = reinterpret_cast<std::int64_t (*)(REALstring, REALstring)>(host_.find(kBytes));
   ASSERT_NE(fn, nullptr);
   host_.begin_ledger();
-  REALstring s = host_.make_string("xyz", zul_host::kUTF8);
+  REALstring s = host_.make_string("xyz", text_encoding::kUTF8);
   const int locks = host_.service_calls("REALLockString");
   const int unlocks = host_.service_calls("REALUnlockString");
   EXPECT_EQ(fn(s, s), 1);

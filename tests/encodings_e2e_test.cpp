@@ -202,6 +202,8 @@ TEST_F(Encodings, readiness) {
       {tagged("Hello", kUTF16), false, "UTF-16 encoding"},
       {tagged("Hello", kLatin1), false, "ISO Latin 1 encoding"},
       {utf8(""), true, "empty"},
+      {tagged("", kUTF16), true, "empty UTF-16: nothing to escape, the tag does not matter"},
+      {tagged("", kLatin1), true, "empty ISO Latin 1"},
       {null_string(), true, "null"},
   };
   for (const auto& row : rows) {

@@ -17,10 +17,10 @@
 // Wanted results: the null string, or bytes with an encoding.
 inline zul_host::Str none() { return zul_host::null_string(); }
 inline zul_host::Str ascii(std::string_view bytes) {
-  return zul_host::tagged(bytes, zul_host::kASCII);
+  return zul_host::tagged(bytes, text_encoding::kASCII);
 }
 inline zul_host::Str unknown(std::string_view bytes) {
-  return zul_host::tagged(bytes, zul_host::kUnknown);
+  return zul_host::tagged(bytes, text_encoding::kUnknown);
 }
 // UTF-16 text in the host's (little-endian) byte order, from code units.
 inline zul_host::Str utf16(std::u16string_view units) {
@@ -29,7 +29,7 @@ inline zul_host::Str utf16(std::u16string_view units) {
     bytes += static_cast<char>(u & 0xFF);
     bytes += static_cast<char>(u >> 8);
   }
-  return zul_host::tagged(bytes, zul_host::kUTF16);
+  return zul_host::tagged(bytes, text_encoding::kUTF16);
 }
 
 // A result equals the wanted one: both null, or the same bytes and encoding.

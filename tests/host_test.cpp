@@ -16,6 +16,8 @@
 
 namespace {
 
+using namespace text_encoding;
+
 using namespace zul_host;
 
 template <class Fn>

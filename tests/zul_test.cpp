@@ -10,6 +10,8 @@
 
 namespace {
 
+using namespace text_encoding;
+
 using namespace zul_host;
 
 TEST(parse_argument, forms_by_type) {
@@ -182,18 +184,87 @@ TEST(run_zul, statuses_and_output) {
        "A\n",
        "",
        "per-method host"},
+      {{"call", "FakeEchoZUL", "hi", "--verbose"}, 0, "hi\n", "called FakeEchoZUL", "option last"},
+      {{"call", "--verbose", "FakeEchoZUL", "hi"}, 0, "hi\n", "called", "option after call"},
+      {{"list", "--host-version", "none"},
+       0,
+       "FakeEchoZUL(s as string) as string\n",
+       "",
+       "option after list"},
+      {{"call", "FakeEchoZUL", "--", "--verbose"}, 0, "--verbose\n", "", "-- ends the options"},
+      {{"call", "FakeEchoZUL", "hi", "--plugin"},
+       2,
+       "",
+       "incomplete option",
+       "option value missing"},
   };
   for (const auto& row : rows) {
     SCOPED_TRACE(row.why);
     const ZulRun run = zul(row.args);
     EXPECT_EQ(run.status, row.want_status) << run.err;
-    if (row.want_status == 0 || row.want_status == 3) {
+    if (row.want_status == 3 || (row.want_status == 0 && row.args[0] != "list")) {
       EXPECT_EQ(run.out, row.want_out);
+    } else if (row.want_status == 0) {
+      EXPECT_EQ(run.out.substr(0, run.out.find('\n') + 1), row.want_out);
     }
     EXPECT_NE(run.err.find(row.want_err_part), std::string::npos) << run.err;
   }
   const ZulRun list = zul({"list"});
   EXPECT_EQ(list.out.substr(0, list.out.find('\n')), "FakeEchoZUL(s as string) as string");
+}
+
+// Command lines that used to end the process (an uncaught stream exception
+// for a directory, a segmentation fault for a ptr size beyond its bytes) or
+// to blame the overloads: each gives status 2 and names the argument.
+TEST(run_zul, bad_command_lines_are_reported_never_crash) {
+  const std::string dir = ::testing::TempDir();
+  struct {
+    std::vector<std::string> args;
+    std::string want_err_part;
+    const char* why;
+  } rows[] = {
+      {{"call", "EncodingToHexZUL", "file:" + dir},
+       "argument 1 (file:" + dir + "): is a directory",
+       "a directory for file:"},
+      {{"call", "EncodingToHexZUL", "file:" + dir + "/zul-no-such-file"},
+       "no such file",
+       "a missing file"},
+      {{"call", "EncodingToHexZUL", "file:/dev/null"}, "not a regular file", "a device"},
+      {{"call", "CheckUTF8ZUL", "hex:41", "100000000", "?"},
+       "argument 2 (size): 100000000 is more than the 1 byte that argument 1 (data) holds",
+       "ptr size beyond the bytes given"},
+      {{"call", "GetStringsFromDataZUL", "hex:4142", "3", "0"},
+       "more than the 2 bytes",
+       "ptr size one past the bytes"},
+      {{"call", "EncodingToHexZUL", "hex:4G"},
+       "'G' at position 2 of the digits is not a hex digit",
+       "a non-hex digit"},
+      {{"call", "EncodingToHexZUL", "hex:414"}, "an odd number of hex digits (3)", "odd digits"},
+      {{"call", "StringXORZUL", "a", "b", "x"},
+       "argument 3 (MaskOffset): 'x' is not a valid",
+       "an integer that is none"},
+      {{"call", "InStrBytesZUL", "a"}, "argument 2 (find) is missing", "too few arguments"},
+      {{"call", "InStrBytesZUL", "a", "b", "c"}, "takes 2 arguments, given 3", "too many"},
+  };
+  for (const auto& row : rows) {
+    SCOPED_TRACE(row.why);
+    std::ostringstream out, err;
+    EXPECT_EQ(run_zul(row.args, ZUL_PLUGIN_PATH, out, err), 2);
+    EXPECT_NE(err.str().find(row.want_err_part), std::string::npos) << err.str();
+    EXPECT_EQ(out.str(), "");
+  }
+  std::ostringstream out, err;
+  EXPECT_EQ(run_zul({"call", "CheckUTF8ZUL", "hex:41FF", "2", "?"}, ZUL_PLUGIN_PATH, out, err), 0)
+      << err.str();
+  EXPECT_EQ(out.str(), "A?\n");
+}
+
+TEST(argument_problem, hex_and_file_forms) {
+  EXPECT_EQ(argument_problem("hex:C3a9"), "");
+  EXPECT_EQ(argument_problem("hex:"), "");
+  EXPECT_EQ(argument_problem("plain text"), "");
+  EXPECT_EQ(argument_problem("hex:0x"), "'x' at position 2 of the digits is not a hex digit");
+  EXPECT_EQ(argument_problem("file:/dev/null"), "is not a regular file");
 }
 
 TEST(zul_tool, runs_as_a_program) {

@@ -1,11 +1,16 @@
-// Byte-class tests and the printable filter. The tests read eight bytes per
-// step and use two classic word tricks: a byte has its high bit set when
-// (w & 0x80..80) is non-zero, and some byte is below 0x20 exactly when
-// (w - 0x20..20) & ~w & 0x80..80 is non-zero (a borrow can only start at a
-// byte below 0x20, and a byte of 0x80 or more never sets its own flag).
+// Byte-class tests and the printable filter. Long inputs search for the
+// first byte outside the class with the byte-set kernels; short ones read
+// eight bytes per step and use two classic word tricks: a byte has its high
+// bit set when (w & 0x80..80) is non-zero, and some byte is below 0x20
+// exactly when (w - 0x20..20) & ~w & 0x80..80 is non-zero (a borrow can
+// only start at a byte below 0x20, and a byte of 0x80 or more never sets its
+// own flag).
 #include "text/char_class.h"
 
 #include <cstring>
+
+#include "common/byte_set.h"
+#include "text/char_class_kernels.h"
 
 namespace zul::text {
 namespace {
@@ -13,7 +18,7 @@ namespace {
 constexpr std::uint64_t kOnes = 0x0101010101010101ull;
 constexpr std::uint64_t kHigh = 0x8080808080808080ull;
 
-bool byte_in(std::uint8_t c, byte_class cls) {
+constexpr bool byte_in(std::uint8_t c, byte_class cls) {
   switch (cls) {
     case byte_class::seven_bit:
       return c <= 0x7F;
@@ -39,6 +44,33 @@ bool word_in(std::uint64_t w, byte_class cls) {
   return false;
 }
 
+bool all_bytes_in_words(std::span<const std::uint8_t> bytes, byte_class cls) {
+  std::size_t i = 0;
+  for (; i + 8 <= bytes.size(); i += 8) {
+    std::uint64_t w;
+    std::memcpy(&w, bytes.data() + i, 8);
+    if (!word_in(w, cls)) return false;
+  }
+  for (; i < bytes.size(); ++i) {
+    if (!byte_in(bytes[i], cls)) return false;
+  }
+  return true;
+}
+
+// The bytes outside each class, prepared once at compile time.
+constexpr simd::byte_set complement(byte_class cls) {
+  simd::byte_set out;
+  for (unsigned b = 0; b < 256; ++b) {
+    if (!byte_in(static_cast<std::uint8_t>(b), cls)) out.add(static_cast<std::uint8_t>(b));
+  }
+  return out;
+}
+constexpr simd::byte_set kOutside[] = {complement(byte_class::seven_bit),
+                                       complement(byte_class::printable),
+                                       complement(byte_class::non_control)};
+
+const simd::byte_set& outside(byte_class cls) { return kOutside[static_cast<int>(cls)]; }
+
 }  // namespace
 
 std::optional<byte_class> byte_class_for_mode(std::int64_t mode) noexcept {
@@ -56,26 +88,15 @@ std::optional<byte_class> byte_class_for_mode(std::int64_t mode) noexcept {
 
 bool all_bytes_in(std::span<const std::uint8_t> bytes, byte_class cls) noexcept {
   if (bytes.empty()) return false;
-  std::size_t i = 0;
-  for (; i + 8 <= bytes.size(); i += 8) {
-    std::uint64_t w;
-    std::memcpy(&w, bytes.data() + i, 8);
-    if (!word_in(w, cls)) return false;
-  }
-  for (; i < bytes.size(); ++i) {
-    if (!byte_in(bytes[i], cls)) return false;
-  }
-  return true;
+  // Short inputs: the word loop costs less than a kernel call.
+  if (bytes.size() < 32) return all_bytes_in_words(bytes, cls);
+  return simd::find_first_in_set(outside(cls), bytes) == bytes.size();
 }
 
 std::string replace_non_printable(std::span<const std::uint8_t> bytes, std::uint8_t replacement) {
   std::string out(bytes.size(), '\0');
-  // Branch-free per byte so the compiler can vectorise the loop.
-  for (std::size_t i = 0; i < bytes.size(); ++i) {
-    const std::uint8_t c = bytes[i];
-    const bool keep = static_cast<std::uint8_t>(c - 0x20) < 0x60;
-    out[i] = static_cast<char>(keep ? c : replacement);
-  }
+  detail::active_char_class_kernels().replace_non_printable(
+      bytes.data(), bytes.size(), replacement, reinterpret_cast<std::uint8_t*>(out.data()));
   return out;
 }
 

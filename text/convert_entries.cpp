@@ -73,15 +73,15 @@ std::uint32_t encoding_of(txt::marker_form form) {
 
 }  // namespace
 
-int64_t DetectUnicodeMarkers(REALstring s) noexcept {
-  return quietly<int64_t>(0, [&]() -> int64_t {
+std::int64_t DetectUnicodeMarkers(REALstring s) noexcept {
+  return quietly<std::int64_t>(0, [&]() -> std::int64_t {
     if (!s) return 0;
     rbData in(s);
     return txt::detect_unicode_marker(in.bytes());
   });
 }
 
-REALstring GetUnicodeMarkers(int64_t kind) noexcept {
+REALstring GetUnicodeMarkers(std::int64_t kind) noexcept {
   return quietly<REALstring>(nullptr, [&]() -> REALstring {
     const auto marker = txt::unicode_marker_for(kind);
     if (!marker) return nullptr;
@@ -109,7 +109,7 @@ REALstring EncodingToCP1252(REALstring s) noexcept {
   return quietly<REALstring>(nullptr, [&] { return encoding_to(s, txt::kWindows1252); });
 }
 
-REALstring ScientificStrZUL(double d, int64_t digits) noexcept {
+REALstring ScientificStrZUL(double d, std::int64_t digits) noexcept {
   return quietly<REALstring>(
       nullptr, [&] { return build_string(txt::format_scientific(d, digits).view(), kASCII); });
 }

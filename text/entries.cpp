@@ -24,19 +24,19 @@ namespace {
 // The shared core of the three CheckUTF8ZUL overloads, run inside the trap.
 // No bytes (null data, size 0 or negative) give the null string without
 // reading the placeholder.
-REALstring CheckUTF8(const void* data, int64_t size, REALstring placeholder) {
+REALstring CheckUTF8(const void* data, std::int64_t size, REALstring placeholder) {
   if (!data || size <= 0) return nullptr;
   rbText ph(placeholder);
   std::string_view text = ph.utf8();
   text = text.substr(0, text.find('\0'));  // the placeholder ends at its first zero byte
-  const std::string out = zul::text::repair_utf8(
+  const zul::out_buffer out = zul::text::repair_utf8(
       {static_cast<const std::uint8_t*>(data), static_cast<std::size_t>(size)}, text);
-  return build_string(out, kUTF8);
+  return build_string(out.view(), kUTF8);
 }
 
 }  // namespace
 
-REALstring CheckUTF8p(void* data, int64_t size, REALstring placeholder) noexcept {
+REALstring CheckUTF8p(void* data, std::int64_t size, REALstring placeholder) noexcept {
   return trapped<REALstring>(nullptr, [&] { return CheckUTF8(data, size, placeholder); });
 }
 
@@ -55,7 +55,7 @@ REALstring CheckUTF8s(REALstring data, REALstring placeholder) noexcept {
 }
 
 // Failures are silent here: a buffer that cannot be had gives the null string.
-REALstring ReplaceNonPrintableCharactersZUL(REALstring s, int64_t replace_value) noexcept {
+REALstring ReplaceNonPrintableCharactersZUL(REALstring s, std::int64_t replace_value) noexcept {
   return quietly<REALstring>(nullptr, [&]() -> REALstring {
     rbData bytes(s);
     if (bytes.empty() || !zul::fits_result(bytes.bytes().size())) return nullptr;
@@ -72,7 +72,7 @@ bool IsASCIIString1(REALstring s) noexcept {
   });
 }
 
-bool IsASCIIString2(REALstring s, int64_t mode) noexcept {
+bool IsASCIIString2(REALstring s, std::int64_t mode) noexcept {
   return quietly(false, [&] {
     const std::optional<zul::text::byte_class> cls = zul::text::byte_class_for_mode(mode);
     if (!cls) return false;

@@ -1,258 +1,183 @@
-// Exact decimal formatting of doubles. A finite double is m * 2^e with an
-// integer m below 2^53; its decimal digits are those of m * 2^e (e >= 0) or
-// of m * 5^-e with the point -e places from the right (e < 0), computed in a
-// fixed big integer of base-10^9 limbs (at most 767 digits). Rounding to a
-// digit position is then exact, half to even. The plain text follows its
-// own rules on top of the "%.99f" text: see format_plain.
+// Number formatting on std::to_chars with a precision, whose digits are the
+// exact decimal value of the double rounded half to even (libstdc++ and
+// libc++ both implement it with Ryu printf). The plain text needs only the
+// digits up to its cut, not all 99 decimals: see fraction_decimals.
 #include "text/number_format.h"
 
 #include <algorithm>
 #include <bit>
+#include <charconv>
 #include <cmath>
-#include <limits>
 
 namespace zul::text {
 namespace {
 
-constexpr std::uint32_t kLimbBase = 1000000000;  // 10^9 per limb
-constexpr int kMaxLimbs = 90;                    // 810 digits >= 767 needed
+// inf, -inf and nan written to text; false for finite values.
+bool put_special(number_text& text, double d) {
+  std::string_view s;
+  if (std::isnan(d)) {
+    s = "nan";  // the sign of a NaN is not shown
+  } else if (std::isinf(d)) {
+    s = d < 0 ? "-inf" : "inf";
+  } else {
+    return false;
+  }
+  text.size = s.copy(text.chars.data(), s.size());
+  return true;
+}
 
-// The significant digits of a non-negative double, without leading or
-// trailing zeros; the value is 0.digits * 10^point. count 0 means zero.
-struct exact_decimal {
-  std::array<char, kMaxLimbs * 9> digits;
-  int count = 0;
-  int point = 0;
-};
-
-void expand(double magnitude, exact_decimal& out) noexcept {
-  const auto bits = std::bit_cast<std::uint64_t>(magnitude);
+// True when the positive double f is a multiple of 10^-q, that is when its
+// binary expansion m * 2^e (m odd) has at most q places after the point.
+bool has_at_most_decimals(double f, int q) {
+  const auto bits = std::bit_cast<std::uint64_t>(f);
   const int biased = static_cast<int>((bits >> 52) & 0x7FF);
   std::uint64_t m = bits & ((std::uint64_t{1} << 52) - 1);
-  int e = -1074;  // subnormals and zero
+  int e = -1074;
   if (biased != 0) {
     m |= std::uint64_t{1} << 52;
     e = biased - 1075;
   }
-  out.count = 0;
-  out.point = 0;
-  if (m == 0) return;
-  while ((m & 1) == 0 && e < 0) {  // fewer factors of 5 to multiply in
-    m >>= 1;
-    ++e;
-  }
-
-  std::array<std::uint32_t, kMaxLimbs> limbs;  // least significant first
-  int n = 0;
-  limbs[n++] = static_cast<std::uint32_t>(m % kLimbBase);
-  if (m >= kLimbBase) limbs[n++] = static_cast<std::uint32_t>(m / kLimbBase);  // m < 10^18
-  auto multiply = [&](std::uint64_t factor) {
-    std::uint64_t carry = 0;
-    for (int i = 0; i < n; ++i) {
-      const std::uint64_t v = limbs[i] * factor + carry;  // < 10^9 * 2^31 + 2^31
-      limbs[i] = static_cast<std::uint32_t>(v % kLimbBase);
-      carry = v / kLimbBase;
-    }
-    while (carry != 0) {
-      limbs[n++] = static_cast<std::uint32_t>(carry % kLimbBase);
-      carry /= kLimbBase;
-    }
-  };
-  int fraction_digits = 0;
-  if (e > 0) {
-    for (int left = e; left > 0; left -= 31) multiply(std::uint64_t{1} << std::min(left, 31));
-  } else if (e < 0) {
-    constexpr std::uint64_t kFivePow13 = 1220703125;
-    fraction_digits = -e;
-    for (int left = -e; left > 0; left -= 13) {
-      std::uint64_t factor = kFivePow13;
-      if (left < 13) {
-        factor = 1;
-        for (int i = 0; i < left; ++i) factor *= 5;
-      }
-      multiply(factor);
-    }
-  }
-
-  char* p = out.digits.data();
-  char top[10];
-  int top_len = 0;
-  for (std::uint32_t v = limbs[n - 1]; v != 0; v /= 10)
-    top[top_len++] = static_cast<char>('0' + v % 10);
-  while (top_len > 0) *p++ = top[--top_len];
-  for (int i = n - 2; i >= 0; --i) {
-    std::uint32_t v = limbs[i];
-    for (int k = 8; k >= 0; --k) {
-      p[k] = static_cast<char>('0' + v % 10);
-      v /= 10;
-    }
-    p += 9;
-  }
-  out.count = static_cast<int>(p - out.digits.data());
-  out.point = out.count - fraction_digits;
-  while (out.count > 0 && out.digits[out.count - 1] == '0') --out.count;
+  e += std::countr_zero(m);
+  return -e <= q;
 }
 
-// Keeps the first keep significant digits, rounding half to even on the
-// exact value. keep may be zero or negative (the value may round to 0).
-void round_to(exact_decimal& x, std::int64_t keep) noexcept {
-  if (x.count == 0 || keep >= x.count) return;
-  if (keep < 0) {  // the first dropped digit is a leading 0
-    x.count = 0;
-    return;
-  }
-  const int k = static_cast<int>(keep);
-  const char next = x.digits[k];
-  const bool more = x.count > k + 1;  // non-zero digits after next (none trail)
-  const bool odd = k > 0 && ((x.digits[k - 1] - '0') & 1);
-  const bool up = next > '5' || (next == '5' && (more || odd));
-  x.count = k;
-  if (up) {
-    int i = k - 1;
-    while (i >= 0 && x.digits[i] == '9') --i;
-    if (i < 0) {  // 99..9 + 1 = 10..0
-      x.digits[0] = '1';
-      x.count = 1;
-      ++x.point;
-      return;
+// The significant digits kept plus the digit that decides the rounding, and
+// the guard digits beyond them that show whether the "%.99f" text could
+// differ from the exact value's digits there.
+constexpr int kGuard = 3;
+
+// Writes the first decimals of f (0 < f < 1) as "%.99f" prints them and
+// returns how many: all 99, or at least up to the count-th digit from the
+// first one that is not 0. No digit that is not 0 means the fraction is
+// zero at 99 decimals.
+//
+// The fast way asks for count + kGuard significant digits, rounded at the
+// last one (decimal q). Up to the count-th they are the digits of the "%.99f"
+// text (rounded at decimal 99 >= q) unless a rounding carry could reach
+// them: that needs the exact guard digits to be all 9, which shows as guard
+// digits all 9 or all 0 (after a carry). Such rare values, and those with
+// q beyond 99, take all 99 decimals instead.
+int fraction_decimals(double f, int count, char* out) {
+  if (f < 4e-100) return 0;  // below 5e-100, which rounds to zero at 99 decimals
+  if (f >= 1e-80) {
+    char sci[48];  // d.<count + kGuard - 1 digits>e-XX
+    const int precision = count + kGuard - 1;
+    const char* end =
+        std::to_chars(sci, sci + sizeof sci, f, std::chars_format::scientific, precision).ptr;
+    const char* e = std::find(static_cast<const char*>(sci), end, 'e');
+    int exponent = 0;
+    std::from_chars(e + 1, end, exponent);
+    const int leading = -exponent - 1;  // zeros after the point
+    const int q = leading + 1 + precision;
+    const std::string_view guard(e - kGuard, kGuard);
+    const bool clear = guard.find_first_not_of('0') != std::string_view::npos &&
+                       guard.find_first_not_of('9') != std::string_view::npos;
+    if (q <= 99 && (clear || has_at_most_decimals(f, q))) {
+      std::fill_n(out, leading, '0');
+      out[leading] = sci[0];
+      std::copy_n(sci + 2, count - 1, out + leading + 1);
+      return leading + count;
     }
-    ++x.digits[i];
-    x.count = i + 1;
   }
-  while (x.count > 0 && x.digits[x.count - 1] == '0') --x.count;
+  char fixed[104];  // "0." and 99 decimals
+  std::to_chars(fixed, fixed + sizeof fixed, f, std::chars_format::fixed, 99);
+  std::copy_n(fixed + 2, 99, out);
+  return 99;
 }
 
-// Appends to a number_text up to a character limit; later puts are dropped.
-struct writer {
-  number_text& text;
-  std::size_t limit;
-  bool room() const { return text.size < limit; }
-  void put(char c) {
-    if (room()) text.chars[text.size++] = c;
+// Adds one unit in the last place of the text t[0, len), carrying leftwards
+// over the point; a carry past the first digit inserts a 1 in front of it
+// (after a minus sign), using the one spare character before t. Returns the
+// new start of the text.
+char* round_up(char* t, std::size_t& len) {
+  std::ptrdiff_t i = static_cast<std::ptrdiff_t>(len) - 1;
+  for (; i >= 0 && t[i] != '-'; --i) {
+    if (t[i] == '.') continue;
+    if (t[i] != '9') break;
+    t[i] = '0';
   }
-  void put(std::string_view s) {
-    for (const char c : s) put(c);
+  if (i >= 0 && t[i] != '-') {
+    ++t[i];
+    return t;
   }
-};
-
-// inf, -inf and nan; false for finite values.
-bool put_special(writer& w, double d) {
-  if (std::isnan(d)) {
-    w.put("nan");  // the sign of a NaN is not shown
-  } else if (std::isinf(d)) {
-    w.put(d < 0 ? "-inf" : "inf");
-  } else {
-    return false;
-  }
-  return true;
+  const auto at = static_cast<std::size_t>(i + 1);
+  std::copy_n(t, at, t - 1);
+  t[at - 1] = '1';
+  ++len;
+  return t - 1;
 }
 
-char digit_at(const exact_decimal& x, std::int64_t index) {
-  return (index >= 0 && index < x.count) ? x.digits[static_cast<std::size_t>(index)] : '0';
+// Writes the integer part of a non-negative double, digit for digit.
+char* put_integer(char* p, double whole) {
+  if (whole < 0x1p64) return std::to_chars(p, p + 320, static_cast<std::uint64_t>(whole)).ptr;
+  return std::to_chars(p, p + 320, whole, std::chars_format::fixed, 0).ptr;
 }
 
 }  // namespace
 
-namespace detail {
-
-number_text format_fixed(double d, int precision, std::size_t limit) noexcept {
-  number_text text;
-  writer w{text, std::min<std::size_t>(limit, text.chars.size() - 1)};
-  if (put_special(w, d)) return text;
-  exact_decimal x;
-  expand(std::fabs(d), x);
-  round_to(x, std::int64_t{x.point} + precision);
-  if (std::signbit(d)) w.put('-');
-  if (x.count == 0 || x.point <= 0) {
-    w.put('0');
-  } else {
-    for (int i = 0; i < x.point && w.room(); ++i) w.put(digit_at(x, i));
-  }
-  if (precision > 0) w.put('.');
-  for (int f = 0; f < precision && w.room(); ++f) w.put(digit_at(x, std::int64_t{x.point} + f));
-  return text;
-}
-
-}  // namespace detail
-
 number_text format_scientific(double d, std::int64_t digits) noexcept {
+  number_text text;
+  if (put_special(text, d)) return text;
   // The precision is read as a C int; a negative one means the default, 6.
+  // A double has at most 767 significant digits, so beyond 800 decimals only
+  // zeros follow, and the text is cut long before: 800 shows the same text.
   std::int32_t precision = static_cast<std::int32_t>(digits);
   if (precision < 0) precision = 6;
-  number_text text;
-  writer w{text, 498};
-  if (put_special(w, d)) return text;
-  if (std::signbit(d)) w.put('-');
-  exact_decimal x;
-  expand(std::fabs(d), x);
-  round_to(x, std::int64_t{precision} + 1);
-  w.put(x.count == 0 ? '0' : x.digits[0]);
-  if (precision > 0) w.put('.');
-  for (std::int64_t i = 1; i <= precision && w.room(); ++i) w.put(digit_at(x, i));
-  const int exponent = x.count == 0 ? 0 : x.point - 1;
-  w.put('e');
-  w.put(exponent < 0 ? '-' : '+');
-  const int magnitude = exponent < 0 ? -exponent : exponent;
-  if (magnitude >= 100) w.put(static_cast<char>('0' + magnitude / 100));
-  w.put(static_cast<char>('0' + magnitude / 10 % 10));
-  w.put(static_cast<char>('0' + magnitude % 10));
+  char* const out = text.chars.data();
+  if (precision <= 400) {  // at most 409 characters: straight into the text
+    const char* end =
+        std::to_chars(out, out + text.chars.size(), d, std::chars_format::scientific, precision)
+            .ptr;
+    text.size = std::min<std::size_t>(static_cast<std::size_t>(end - out), 498);
+    return text;
+  }
+  char buffer[816];  // -d.<800 digits>e+308
+  const char* end = std::to_chars(buffer, buffer + sizeof buffer, d, std::chars_format::scientific,
+                                  std::min(precision, 800))
+                        .ptr;
+  text.size = std::min<std::size_t>(static_cast<std::size_t>(end - buffer), 498);
+  std::copy_n(buffer, text.size, out);
   return text;
 }
 
-// Starts from the "%.99f" text, then:
-//  1. a trailing run of zeros shrinks to one 0 (never below 4 characters);
-//  2. k = characters before the point other than 0 (the minus sign counts):
-//     k > 14 ends the text at the point; otherwise the text keeps 15 - k
-//     characters from the first non-zero one after the point;
-//  3. the kept text is rounded up when the next digit of the full text is
-//     5 or more, carrying leftwards over the point;
-//  4. a trailing run of zeros after the point shrinks to one 0 again.
+// The "%.99f" text is never built. Its integer part is that of d (99
+// decimals cannot round a double's fraction up to 1), and the cut needs its
+// decimals only up to fifteen characters from the first significant one,
+// plus one for the rounding.
 number_text format_plain(double d) noexcept {
-  const number_text full = detail::format_fixed(d, 99);
-  if (!std::isfinite(d)) return full;
-  const std::string_view f = full.view();
-  std::size_t len = f.size();
-  while (len >= 4 && f[len - 1] == '0' && f[len - 2] == '0') --len;
-
-  const std::size_t point = f.find('.');
-  const auto k = static_cast<std::size_t>(std::count_if(
-      f.begin(), f.begin() + static_cast<std::ptrdiff_t>(point), [](char c) { return c != '0'; }));
-  std::size_t next;  // position in f of the first digit after the kept text
-  if (k > 14) {
-    len = point;
-    next = point + 1;
-  } else {
-    std::size_t j = point + 1;
-    while (j < len && f[j] == '0') ++j;
-    len = std::min(len, j + 15 - k);
-    next = len;
-  }
-
-  // One spare character in front for a carry out of the first digit.
   number_text out;
-  char* t = out.chars.data() + 1;
-  std::copy_n(f.data(), len, t);
-  if (next < f.size() && f[next] >= '5') {
-    std::ptrdiff_t i = static_cast<std::ptrdiff_t>(len) - 1;
-    for (; i >= 0 && t[i] != '-'; --i) {
-      if (t[i] == '.') continue;
-      if (t[i] != '9') break;
-      t[i] = '0';
-    }
-    if (i >= 0 && t[i] != '-') {
-      ++t[i];
-    } else {  // carried past the first digit: a new leading 1
-      const std::size_t at = static_cast<std::size_t>(i + 1);
-      --t;
-      std::copy_n(t + 1, at, t);
-      t[at] = '1';
-      ++len;
+  if (put_special(out, d)) return out;
+  const double magnitude = std::fabs(d);
+  const double whole = std::trunc(magnitude);
+  const double fraction = magnitude - whole;  // exact
+
+  char* t = out.chars.data() + 1;  // one spare character for a carry
+  char* p = t;
+  if (std::signbit(d)) *p++ = '-';
+  p = put_integer(p, whole);
+  const auto k = static_cast<int>(std::count_if(t, p, [](char c) { return c != '0'; }));
+  std::size_t len = static_cast<std::size_t>(p - t);
+  if (k > 14) {  // no fraction; its first decimal is 5 or more from 0.5 on
+    if (fraction >= 0.5) t = round_up(t, len);
+  } else {
+    *p++ = '.';
+    char decimals[99];
+    const int n = fraction == 0 ? 0 : fraction_decimals(fraction, 16 - k, decimals);
+    const int first = static_cast<int>(
+        std::find_if(decimals, decimals + n, [](char c) { return c != '0'; }) - decimals);
+    if (first == n) {  // zero at 99 decimals
+      *p++ = '0';
+      len = static_cast<std::size_t>(p - t);
+    } else {
+      const int cut = first + 15 - k;  // index of the deciding digit
+      const int kept = std::min(cut, n);
+      p = std::copy_n(decimals, kept, p);
+      len = static_cast<std::size_t>(p - t);
+      if (cut < n && decimals[cut] >= '5') t = round_up(t, len);
+      while (t[len - 1] == '0' && t[len - 2] == '0') --len;
     }
   }
-  if (k <= 14) {  // the text has its point
-    while (t[len - 1] == '0' && t[len - 2] == '0') --len;
-  }
-  if (t != out.chars.data()) std::copy_n(t, len, out.chars.data());
+  std::copy_n(t, len, out.chars.data());
   out.size = len;
   return out;
 }

@@ -18,7 +18,8 @@ struct entry {
   std::string declaration;  // exactly as registered with the host
   std::string summary, arguments, result, raises;
   std::vector<std::string> example;  // lines of code in the host's BASIC
-  std::string anchor;                // unique id within the page
+  std::string unchecked;  // why a result stated in the example cannot be evaluated; not shown
+  std::string anchor;     // unique id within the page
 };
 
 struct parsed {
@@ -41,79 +42,95 @@ inline std::string_view method_name(std::string_view declaration) {
   return declaration.substr(0, declaration.find('('));
 }
 
+// The first line of source, which loses it (and its line feed).
+inline std::string_view next_line(std::string_view& source) {
+  const std::size_t end = source.find('\n');
+  const std::string_view line = source.substr(0, end);
+  source.remove_prefix(end == std::string_view::npos ? source.size() : end + 1);
+  return line;
+}
+
+// Applies one "field: text" line (raw as written, line trimmed) to e; last
+// becomes the field a continuation line extends. "" or what is wrong.
+inline std::string apply_field(entry& e, std::string_view raw, std::string_view line,
+                               std::string*& last) {
+  const std::size_t colon = line.find(':');
+  if (colon == std::string_view::npos) return "expected \"field: text\"";
+  const std::string_view key = line.substr(0, colon);
+  if (key == "example") {
+    e.example.push_back(std::string(raw.substr(raw.find(':') + 1)).erase(0, 1));
+    last = nullptr;
+    return "";
+  }
+  std::string* field = key == "summary"     ? &e.summary
+                       : key == "args"      ? &e.arguments
+                       : key == "result"    ? &e.result
+                       : key == "raises"    ? &e.raises
+                       : key == "unchecked" ? &e.unchecked
+                                            : nullptr;
+  if (!field) return "unknown field \"" + std::string(key) + "\"";
+  *field = std::string(trim(line.substr(colon + 1)));
+  last = field;
+  return "";
+}
+
+// Checks that every entry has summary, result and example, and gives each
+// its anchor: the method name, numbered when the name is overloaded. "" or
+// what is wrong.
+inline std::string finish_entries(std::vector<entry>& entries) {
+  std::map<std::string, int, std::less<>> uses, seen;
+  for (const entry& e : entries) ++uses[std::string(method_name(e.declaration))];
+  for (entry& e : entries) {
+    if (e.summary.empty() || e.result.empty() || e.example.empty())
+      return e.declaration + ": needs summary, result and example";
+    std::string name(method_name(e.declaration));
+    e.anchor = uses[name] > 1 ? name + "-" + std::to_string(++seen[name]) : name;
+  }
+  return "";
+}
+
 }  // namespace detail
 
 // Parses the help source. Lines: "# ..." comment, "== Family" starts a
 // family, "@ <declaration>" starts an entry, "summary:", "args:",
-// "result:", "raises:" set a field (a field may continue on lines that
-// start with a blank), "example:" adds one line of example code. Every
+// "result:", "raises:", "unchecked:" set a field (a field may continue on
+// lines that start with a blank), "example:" adds one line of example
+// code. "unchecked:" says why a result an example states in a "//" comment
+// cannot be evaluated by the example test; it is not rendered. Every
 // entry needs summary, result and example; anything else is an error
 // naming its line.
 inline parsed parse_help(std::string_view source) {
   parsed out;
   std::string family;
   std::string* last = nullptr;
-  int line_no = 0;
-  auto fail = [&](std::string_view why) {
-    out.error = "line " + std::to_string(line_no) + ": " + std::string(why);
-    return out;
-  };
-  while (!source.empty()) {
-    ++line_no;
-    std::size_t end = source.find('\n');
-    std::string_view raw = source.substr(0, end);
-    source.remove_prefix(end == std::string_view::npos ? source.size() : end + 1);
-    std::string_view line = detail::trim(raw);
+  for (int line_no = 1; !source.empty(); ++line_no) {
+    const std::string_view raw = detail::next_line(source);
+    const std::string_view line = detail::trim(raw);
+    std::string error;
     if (line.empty() || line.front() == '#') {
       last = nullptr;
-      continue;
-    }
-    if (raw.front() == ' ' && last) {  // continuation of the previous field
+    } else if (raw.front() == ' ' && last) {  // continuation of the previous field
       *last += ' ';
       *last += line;
-      continue;
-    }
-    if (line.starts_with("== ")) {
+    } else if (line.starts_with("== ")) {
       family = std::string(detail::trim(line.substr(3)));
       last = nullptr;
-      continue;
-    }
-    if (line.starts_with("@ ")) {
-      if (family.empty()) return fail("entry before any \"== \" family");
+    } else if (line.starts_with("@ ")) {
+      if (family.empty()) error = "entry before any \"== \" family";
       out.entries.push_back(
-          {family, std::string(detail::trim(line.substr(2))), {}, {}, {}, {}, {}, {}});
+          {family, std::string(detail::trim(line.substr(2))), {}, {}, {}, {}, {}, {}, {}});
       last = nullptr;
-      continue;
+    } else if (out.entries.empty()) {
+      error = "field before any \"@ \" entry";
+    } else {
+      error = detail::apply_field(out.entries.back(), raw, line, last);
     }
-    if (out.entries.empty()) return fail("field before any \"@ \" entry");
-    entry& e = out.entries.back();
-    std::size_t colon = line.find(':');
-    if (colon == std::string_view::npos) return fail("expected \"field: text\"");
-    std::string_view key = line.substr(0, colon);
-    std::string value(detail::trim(line.substr(colon + 1)));
-    if (key == "example") {
-      e.example.push_back(std::string(raw.substr(raw.find(':') + 1)).erase(0, 1));
-      last = nullptr;
-      continue;
+    if (!error.empty()) {
+      out.error = "line " + std::to_string(line_no) + ": " + error;
+      return out;
     }
-    std::string* field = key == "summary"  ? &e.summary
-                         : key == "args"   ? &e.arguments
-                         : key == "result" ? &e.result
-                         : key == "raises" ? &e.raises
-                                           : nullptr;
-    if (!field) return fail("unknown field \"" + std::string(key) + "\"");
-    *field = std::move(value);
-    last = field;
   }
-  // Anchors: the method name, numbered when the name is overloaded.
-  std::map<std::string, int, std::less<>> uses, seen;
-  for (const entry& e : out.entries) ++uses[std::string(detail::method_name(e.declaration))];
-  for (entry& e : out.entries) {
-    if (e.summary.empty() || e.result.empty() || e.example.empty())
-      return out.error = e.declaration + ": needs summary, result and example", out;
-    std::string name(detail::method_name(e.declaration));
-    e.anchor = uses[name] > 1 ? name + "-" + std::to_string(++seen[name]) : name;
-  }
+  out.error = detail::finish_entries(out.entries);
   return out;
 }
 

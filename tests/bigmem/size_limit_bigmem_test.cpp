@@ -57,7 +57,7 @@ class BigMemory : public HostTest {
   }
 };
 
-Str bytes(std::size_t n, char c) { return tagged(std::string(n, c), zul_host::kUnknown); }
+Str bytes(std::size_t n, char c) { return tagged(std::string(n, c), text_encoding::kUnknown); }
 
 TEST_F(BigMemory, concatenation_of_four_600_mib_strings) {
   const Str part = bytes(600 * kMiB, 'a');
@@ -80,7 +80,7 @@ TEST_F(BigMemory, tag_removal_with_a_31_byte_replacement) {
 TEST_F(BigMemory, utf8_repair_with_a_31_byte_placeholder) {
   const std::string bad(100 * kMiB, '\xFF');
   const Str placeholder = utf8(std::string(31, '?'));
-  expect_refused(100 * kMiB, true, decl(6), tagged(bad, zul_host::kUnknown), placeholder);
+  expect_refused(100 * kMiB, true, decl(6), tagged(bad, text_encoding::kUnknown), placeholder);
   expect_refused(0, true, decl(4), static_cast<const void*>(bad.data()),
                  static_cast<std::int64_t>(bad.size()), placeholder);
 }

@@ -1,0 +1,49 @@
+// Byte-set search: the scalar path (the fallback and the reference of the
+// kernels) and the one-time choice of kernel. SSE2 alone has no byte shuffle,
+// so the SSE2 level uses the scalar path; AVX2, AVX-512 and NEON shuffle.
+#include "common/byte_set.h"
+
+#include <atomic>
+
+namespace zul::simd {
+
+byte_set make_byte_set(bytes_view members) noexcept {
+  byte_set set;
+  for (std::uint8_t b : members) set.add(b);
+  return set;
+}
+
+namespace detail {
+
+std::size_t find_first_in_set_scalar(const byte_set& set, const std::uint8_t* p,
+                                     std::size_t n) noexcept {
+  for (std::size_t i = 0; i < n; ++i) {
+    if (set.contains(p[i])) return i;
+  }
+  return n;
+}
+
+namespace {
+constexpr byte_set_kernels kScalar{find_first_in_set_scalar};
+#if defined(__x86_64__) || defined(_M_X64)
+constexpr byte_set_kernels kAvx2{find_first_in_set_avx2};
+constexpr byte_set_kernels kAvx512{find_first_in_set_avx512};
+constexpr family_tables<byte_set_kernels> kTables{&kScalar, nullptr, &kAvx2, &kAvx512, nullptr};
+#elif defined(__aarch64__)
+constexpr byte_set_kernels kNeon{find_first_in_set_neon};
+constexpr family_tables<byte_set_kernels> kTables{&kScalar, nullptr, nullptr, nullptr, &kNeon};
+#else
+constexpr family_tables<byte_set_kernels> kTables{&kScalar};
+#endif
+std::atomic<const byte_set_kernels*> active_kernels{nullptr};
+}  // namespace
+
+const family_tables<byte_set_kernels>& byte_set_tables() noexcept { return kTables; }
+
+}  // namespace detail
+
+std::size_t find_first_in_set(const byte_set& set, const std::uint8_t* p, std::size_t n) noexcept {
+  return active(detail::byte_set_tables(), detail::active_kernels).find_first(set, p, n);
+}
+
+}  // namespace zul::simd

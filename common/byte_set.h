@@ -1,0 +1,75 @@
+// A set of byte values prepared once, and a search for the first byte of a
+// buffer that belongs to it. The set is stored as two 16-byte nibble tables
+// (rows[h >> 3][l] has bit h & 7 set when byte h * 16 + l is a member), which
+// is both the 256-bit membership and what the vector kernels shuffle: any set
+// size costs the same constant work per block. Stable interface: the search
+// families and the encoders' "next byte that needs work" scans call it.
+#pragma once
+
+#include <cstddef>
+#include <cstdint>
+
+#include "common/bytes.h"
+#include "common/dispatch.h"
+
+namespace zul::simd {
+
+class byte_set {
+ public:
+  constexpr byte_set() = default;
+
+  // Adds one byte value, or the inclusive range first..last (nothing when
+  // first > last).
+  constexpr void add(std::uint8_t b) noexcept {
+    rows_[b >> 7][b & 15] |= static_cast<std::uint8_t>(1u << ((b >> 4) & 7));
+  }
+  constexpr void add_range(std::uint8_t first, std::uint8_t last) noexcept {
+    for (unsigned b = first; b <= last; ++b) add(static_cast<std::uint8_t>(b));
+  }
+
+  constexpr bool contains(std::uint8_t b) const noexcept {
+    return (rows_[b >> 7][b & 15] >> ((b >> 4) & 7)) & 1;
+  }
+
+  // Nibble tables for the kernels: low(l) is the row of bytes 0x00..0x7F
+  // with low nibble l, high(l) the row of bytes 0x80..0xFF.
+  const std::uint8_t* low_rows() const noexcept { return rows_[0]; }
+  const std::uint8_t* high_rows() const noexcept { return rows_[1]; }
+
+ private:
+  alignas(16) std::uint8_t rows_[2][16] = {};
+};
+
+// The set of the given byte values (repeats are harmless; empty gives the
+// empty set).
+byte_set make_byte_set(bytes_view members) noexcept;
+
+// Index of the first byte of [p, p + n) that belongs to set, or n when none
+// does (also for n == 0, where p may be null). Reads no byte outside the
+// range.
+std::size_t find_first_in_set(const byte_set& set, const std::uint8_t* p, std::size_t n) noexcept;
+
+inline std::size_t find_first_in_set(const byte_set& set, bytes_view bytes) noexcept {
+  return find_first_in_set(set, bytes.data(), bytes.size());
+}
+
+namespace detail {
+
+// One kernel per level; tests and benchmarks run each of them.
+struct byte_set_kernels {
+  std::size_t (*find_first)(const byte_set& set, const std::uint8_t* p, std::size_t n) noexcept;
+};
+const family_tables<byte_set_kernels>& byte_set_tables() noexcept;
+
+// The per-level kernels, defined in byte_set_x86.cpp and byte_set_neon.cpp.
+std::size_t find_first_in_set_scalar(const byte_set& set, const std::uint8_t* p,
+                                     std::size_t n) noexcept;
+std::size_t find_first_in_set_avx2(const byte_set& set, const std::uint8_t* p,
+                                   std::size_t n) noexcept;
+std::size_t find_first_in_set_avx512(const byte_set& set, const std::uint8_t* p,
+                                     std::size_t n) noexcept;
+std::size_t find_first_in_set_neon(const byte_set& set, const std::uint8_t* p,
+                                   std::size_t n) noexcept;
+
+}  // namespace detail
+}  // namespace zul::simd

@@ -1,0 +1,121 @@
+// Every byte-set kernel the machine runs against a plain model: a list of
+// member bytes searched one target byte at a time.
+#include "common/byte_set.h"
+
+#include <gtest/gtest.h>
+
+#include <algorithm>
+#include <random>
+#include <vector>
+
+namespace zul::simd {
+namespace {
+
+std::size_t model(const std::vector<std::uint8_t>& members, const std::uint8_t* p, std::size_t n) {
+  for (std::size_t i = 0; i < n; ++i) {
+    if (std::find(members.begin(), members.end(), p[i]) != members.end()) return i;
+  }
+  return n;
+}
+
+template <class Body>
+void for_each_kernel(Body body) {
+  for (isa level : supported_isas()) {
+    SCOPED_TRACE(isa_name(level));
+    body(kernels_for(detail::byte_set_tables(), level));
+  }
+}
+
+TEST(byte_set, membership_of_all_256_values) {
+  for (int member = 0; member < 256; ++member) {
+    const std::uint8_t b = static_cast<std::uint8_t>(member);
+    const byte_set set = make_byte_set({&b, 1});
+    for (int v = 0; v < 256; ++v)
+      EXPECT_EQ(set.contains(static_cast<std::uint8_t>(v)), v == member);
+  }
+  byte_set range;
+  range.add_range(0x30, 0x39);
+  range.add_range(9, 3);  // empty
+  for (int v = 0; v < 256; ++v)
+    EXPECT_EQ(range.contains(static_cast<std::uint8_t>(v)), v >= 0x30 && v <= 0x39);
+}
+
+// Each single-byte set over a buffer holding all 256 values, twice, in a
+// rotated order so each value sits at several block positions.
+TEST(find_first_in_set, every_single_byte_set) {
+  std::vector<std::uint8_t> buf(512);
+  for (std::size_t i = 0; i < buf.size(); ++i) buf[i] = static_cast<std::uint8_t>(i * 7 + 3);
+  for_each_kernel([&](const detail::byte_set_kernels& k) {
+    for (int member = 0; member < 256; ++member) {
+      const std::vector<std::uint8_t> members{static_cast<std::uint8_t>(member)};
+      const byte_set set = make_byte_set(members);
+      for (std::size_t from : {0u, 1u, 63u, 200u}) {
+        ASSERT_EQ(k.find_first(set, buf.data() + from, buf.size() - from),
+                  model(members, buf.data() + from, buf.size() - from))
+            << member << " from " << from;
+      }
+    }
+  });
+}
+
+// Lengths 0..3 vector widths (192 bytes covers AVX-512's two-vector rounds)
+// at every misalignment, with one hit placed at every position or none.
+TEST(find_first_in_set, length_and_alignment_sweep) {
+  const std::vector<std::vector<std::uint8_t>> sets = {
+      {0x00}, {'<', '>', '&', '"'}, {0x7F, 0x80}, {0xFF, 0x0F, 0xF0, 0x10, 0x8F, 0x70}, [] {
+        std::vector<std::uint8_t> all;
+        for (int b = 0x20; b < 0xC0; b += 3) all.push_back(static_cast<std::uint8_t>(b));
+        return all;
+      }()};
+  std::vector<std::uint8_t> buf(192 + 64 + 64);
+  for_each_kernel([&](const detail::byte_set_kernels& k) {
+    for (const auto& members : sets) {
+      const byte_set set = make_byte_set(members);
+      // Filler: a byte outside the set.
+      std::uint8_t filler = 0;
+      while (std::find(members.begin(), members.end(), filler) != members.end()) ++filler;
+      for (std::size_t align = 0; align < 64; ++align) {
+        for (std::size_t n = 0; n <= 192; ++n) {
+          std::fill(buf.begin(), buf.end(), filler);
+          // A member just past the end must not be found.
+          buf[align + n] = members.back();
+          std::uint8_t* p = buf.data() + align;
+          ASSERT_EQ(k.find_first(set, p, n), n) << "n " << n << " align " << align;
+          for (std::size_t hit = 0; hit < n; hit += (n > 40 ? 7 : 1)) {
+            p[hit] = members[hit % members.size()];
+            ASSERT_EQ(k.find_first(set, p, n), hit) << "n " << n << " align " << align;
+            if (hit + 1 < n) p[n - 1] = members[0];  // a later hit changes nothing
+            ASSERT_EQ(k.find_first(set, p, n), hit);
+            p[hit] = filler;
+            p[n - 1] = filler;
+          }
+        }
+      }
+    }
+  });
+}
+
+TEST(find_first_in_set, random_sets_and_buffers_agree_with_the_model) {
+  std::mt19937 rng(12);
+  for (int round = 0; round < 300; ++round) {
+    std::vector<std::uint8_t> members(rng() % 40);
+    for (auto& b : members) b = static_cast<std::uint8_t>(rng());
+    std::vector<std::uint8_t> buf(rng() % 3000);
+    for (auto& b : buf) b = static_cast<std::uint8_t>(rng());
+    const byte_set set = make_byte_set(members);
+    const std::size_t want = model(members, buf.data(), buf.size());
+    EXPECT_EQ(find_first_in_set(set, buf), want);
+    for_each_kernel([&](const detail::byte_set_kernels& k) {
+      ASSERT_EQ(k.find_first(set, buf.data(), buf.size()), want);
+    });
+  }
+}
+
+TEST(find_first_in_set, empty_range_and_null_pointer) {
+  const byte_set set = make_byte_set(bytes_of("ab"));
+  for_each_kernel(
+      [&](const detail::byte_set_kernels& k) { EXPECT_EQ(k.find_first(set, nullptr, 0), 0u); });
+}
+
+}  // namespace
+}  // namespace zul::simd

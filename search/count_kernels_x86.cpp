@@ -1,0 +1,138 @@
+// Counting kernels for x86-64 (AVX2, AVX-512 BW), compiled per function.
+//
+// One byte: each block's compare gives 0xFF (-1) per equal lane, which is
+// subtracted from 8-bit lane counters; after at most 255 blocks the counters
+// are summed into 64-bit lanes with SAD against zero and cleared.
+//
+// Longer patterns: a position is a candidate when its byte equals the
+// pattern's first byte and the byte m - 1 further on equals its last byte;
+// both compares cover a whole block of positions at once, and only
+// candidates, in order, are checked in full. A block holds only positions
+// whose whole pattern lies inside the input; the scalar path continues from
+// the first position after the blocks with the non-overlapping state.
+#include <cstring>
+
+#include "search/count_kernels.h"
+
+#if defined(__x86_64__) || defined(_M_X64)
+#include <immintrin.h>
+
+#define ZUL_AVX2 __attribute__((target("avx2,bmi,bmi2")))
+#define ZUL_AVX512 __attribute__((target("avx2,bmi,bmi2,avx512f,avx512bw,avx512vl,avx512dq")))
+
+namespace zul::search::detail {
+namespace {
+
+// Checks the candidates of one block at positions base + bit, in order.
+inline void check_candidates(std::uint64_t candidates, std::size_t base, const std::uint8_t* p,
+                             const std::uint8_t* find, std::size_t m, std::size_t& next,
+                             std::uint64_t& count) {
+  while (candidates != 0) {
+    const std::size_t pos = base + static_cast<std::size_t>(__builtin_ctzll(candidates));
+    candidates &= candidates - 1;
+    if (pos < next) continue;
+    if (m <= 2 || std::memcmp(p + pos + 1, find + 1, m - 2) == 0) {
+      ++count;
+      next = pos + m;
+    }
+  }
+}
+
+}  // namespace
+
+ZUL_AVX2 std::uint64_t count_byte_avx2(const std::uint8_t* p, std::size_t n,
+                                       std::uint8_t b) noexcept {
+  const __m256i needle = _mm256_set1_epi8(static_cast<char>(b));
+  const __m256i zero = _mm256_setzero_si256();
+  __m256i total = zero;
+  std::size_t i = 0;
+  while (n - i >= 64) {
+    __m256i lanes0 = zero, lanes1 = zero;
+    std::size_t blocks = (n - i) / 64;
+    if (blocks > 255) blocks = 255;
+    for (std::size_t k = 0; k < blocks; ++k, i += 64) {
+      const __m256i a = _mm256_loadu_si256(reinterpret_cast<const __m256i*>(p + i));
+      const __m256i c = _mm256_loadu_si256(reinterpret_cast<const __m256i*>(p + i + 32));
+      lanes0 = _mm256_sub_epi8(lanes0, _mm256_cmpeq_epi8(a, needle));
+      lanes1 = _mm256_sub_epi8(lanes1, _mm256_cmpeq_epi8(c, needle));
+    }
+    total = _mm256_add_epi64(total, _mm256_sad_epu8(lanes0, zero));
+    total = _mm256_add_epi64(total, _mm256_sad_epu8(lanes1, zero));
+  }
+  alignas(32) std::uint64_t sums[4];
+  _mm256_store_si256(reinterpret_cast<__m256i*>(sums), total);
+  return sums[0] + sums[1] + sums[2] + sums[3] + count_byte_scalar(p + i, n - i, b);
+}
+
+ZUL_AVX512 std::uint64_t count_byte_avx512(const std::uint8_t* p, std::size_t n,
+                                           std::uint8_t b) noexcept {
+  const __m512i needle = _mm512_set1_epi8(static_cast<char>(b));
+  const __m512i zero = _mm512_setzero_si512();
+  const __m512i minus_one = _mm512_set1_epi8(-1);
+  __m512i total = zero;
+  std::size_t i = 0;
+  while (n - i >= 128) {
+    __m512i lanes0 = zero, lanes1 = zero;
+    std::size_t blocks = (n - i) / 128;
+    if (blocks > 255) blocks = 255;
+    for (std::size_t k = 0; k < blocks; ++k, i += 128) {
+      const __mmask64 a = _mm512_cmpeq_epi8_mask(_mm512_loadu_si512(p + i), needle);
+      const __mmask64 c = _mm512_cmpeq_epi8_mask(_mm512_loadu_si512(p + i + 64), needle);
+      lanes0 = _mm512_mask_sub_epi8(lanes0, a, lanes0, minus_one);
+      lanes1 = _mm512_mask_sub_epi8(lanes1, c, lanes1, minus_one);
+    }
+    total = _mm512_add_epi64(total, _mm512_sad_epu8(lanes0, zero));
+    total = _mm512_add_epi64(total, _mm512_sad_epu8(lanes1, zero));
+  }
+  // Summed through memory: GCC 12's reduce intrinsic trips -Wuninitialized.
+  alignas(64) std::uint64_t sums[8];
+  _mm512_store_si512(sums, total);
+  std::uint64_t count = 0;
+  for (std::uint64_t s : sums) count += s;
+  // The last 0..127 bytes: masked loads never touch bytes past the end.
+  for (; i < n; i += 64) {
+    const std::size_t left = n - i;
+    const __mmask64 live =
+        left >= 64 ? ~__mmask64{0} : _bzhi_u64(~0ull, static_cast<unsigned>(left));
+    count += static_cast<std::uint64_t>(__builtin_popcountll(
+        _mm512_mask_cmpeq_epi8_mask(live, _mm512_maskz_loadu_epi8(live, p + i), needle)));
+  }
+  return count;
+}
+
+ZUL_AVX2 std::uint64_t count_pattern_avx2(const std::uint8_t* p, std::size_t n,
+                                          const std::uint8_t* find, std::size_t m) noexcept {
+  if (m > n) return 0;
+  const __m256i first = _mm256_set1_epi8(static_cast<char>(find[0]));
+  const __m256i last = _mm256_set1_epi8(static_cast<char>(find[m - 1]));
+  std::uint64_t count = 0;
+  std::size_t next = 0, i = 0;
+  // Positions i..i+31 need bytes up to i + 31 + m - 1 < n.
+  for (; i + 32 + m - 1 <= n; i += 32) {
+    const __m256i a = _mm256_loadu_si256(reinterpret_cast<const __m256i*>(p + i));
+    const __m256i z = _mm256_loadu_si256(reinterpret_cast<const __m256i*>(p + i + m - 1));
+    const __m256i both = _mm256_and_si256(_mm256_cmpeq_epi8(a, first), _mm256_cmpeq_epi8(z, last));
+    const auto candidates = static_cast<std::uint32_t>(_mm256_movemask_epi8(both));
+    if (candidates != 0) check_candidates(candidates, i, p, find, m, next, count);
+  }
+  return count + count_pattern_from(p, n, find, m, i, next);
+}
+
+ZUL_AVX512 std::uint64_t count_pattern_avx512(const std::uint8_t* p, std::size_t n,
+                                              const std::uint8_t* find, std::size_t m) noexcept {
+  if (m > n) return 0;
+  const __m512i first = _mm512_set1_epi8(static_cast<char>(find[0]));
+  const __m512i last = _mm512_set1_epi8(static_cast<char>(find[m - 1]));
+  std::uint64_t count = 0;
+  std::size_t next = 0, i = 0;
+  for (; i + 64 + m - 1 <= n; i += 64) {
+    const __mmask64 a = _mm512_cmpeq_epi8_mask(_mm512_loadu_si512(p + i), first);
+    const __mmask64 candidates =
+        _mm512_mask_cmpeq_epi8_mask(a, _mm512_loadu_si512(p + i + m - 1), last);
+    if (candidates != 0) check_candidates(candidates, i, p, find, m, next, count);
+  }
+  return count + count_pattern_from(p, n, find, m, i, next);
+}
+
+}  // namespace zul::search::detail
+#endif
