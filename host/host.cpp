@@ -56,7 +56,7 @@ const Registration& Host::registration() const { return impl_->registration; }
 
 void* Host::library_symbol(const char* name) const {
   std::lock_guard lock(impl_->mu);
-  return impl_->library ? dlsym(impl_->library, name) : nullptr;
+  return impl_->library ? platform::find_symbol(impl_->library, name) : nullptr;
 }
 
 void* Host::find(std::string_view declaration) const {
