@@ -13,6 +13,7 @@
 namespace {
 
 using namespace zul_host;
+using namespace text_encoding;
 
 std::string utf32(char32_t c) {
   std::string out;
