@@ -54,6 +54,11 @@ void Host::load(const std::string& plugin_path) {
 
 const Registration& Host::registration() const { return impl_->registration; }
 
+void* Host::library_symbol(const char* name) const {
+  std::lock_guard lock(impl_->mu);
+  return impl_->library ? platform::find_symbol(impl_->library, name) : nullptr;
+}
+
 void* Host::find(std::string_view declaration) const {
   std::lock_guard lock(impl_->mu);
   for (const RegisteredMethod& m : impl_->registration.methods) {
