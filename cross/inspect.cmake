@@ -71,8 +71,8 @@ if(PLATFORM MATCHES "^Mac")
   # Every load command and the arm64 code signature, page by page.
   run(macho "${MACHO_CHECK}" "${LIBRARY}")
   string(STRIP "${macho}" macho)
-  string(REPLACE "\n" "; " macho "${macho}")
-  set(min "${min}; ${macho}")
+  string(REPLACE "\n" " / " macho "${macho}")
+  string(APPEND min " - ${macho}")
 
 elseif(PLATFORM MATCHES "^Windows")
   if(PLATFORM MATCHES "x86-64")
