@@ -57,7 +57,7 @@ out_buffer repair_utf8(bytes_view bytes, std::string_view placeholder, std::uint
     // Byte rules from i: up to the first fault when the kernel may resume,
     // through every fault of the stretch otherwise.
     const bool stretch = i < kernel_from;
-    std::size_t stop = stretch ? kernel_from : i + kBlock;
+    std::size_t stop = stretch ? kernel_from : i + 2 * kBlock;
     if (stop > n) stop = n;
     if (!out.ensure((stop - i + 3) * 4)) return out.discard();
     std::uint8_t* o = out.tail();
