@@ -208,4 +208,45 @@ DynamicValue call_dynamic(Host& host, std::string_view declaration,
   return result;
 }
 
+struct RepeatedCall::State {
+  Host& host;
+  Declaration parsed;
+  void* function = nullptr;
+  NativeArguments native;
+  ffi_cif cif{};
+  bool finished = false;
+};
+
+RepeatedCall::RepeatedCall(Host& host, std::string_view declaration,
+                           const std::vector<DynamicValue>& args)
+    : state_(new State{host, checked_declaration(host, declaration, args), host.find(declaration),
+                       NativeArguments{}, ffi_cif{}, false}) {
+  State& s = *state_;
+  host.call_started();
+  pass_arguments(host, args, s.native);
+  if (ffi_prep_cif(&s.cif, FFI_DEFAULT_ABI, static_cast<unsigned>(args.size()),
+                   result_ffi_type(s.parsed.result), s.native.types.data()) != FFI_OK) {
+    finish();
+    throw std::invalid_argument("libffi cannot describe " + std::string(declaration));
+  }
+}
+
+RepeatedCall::~RepeatedCall() { finish(); }
+
+void RepeatedCall::invoke() {
+  State& s = *state_;
+  RawResult raw{};
+  ffi_call(&s.cif, FFI_FN(s.function), &raw, s.native.values.data());
+  const bool handle = s.parsed.result == ValueType::string ||
+                      s.parsed.result == ValueType::memory_block ||
+                      s.parsed.result == ValueType::string_array;
+  if (handle && raw.pointer) s.host.release(raw.pointer);
+}
+
+void RepeatedCall::finish() {
+  if (state_->finished) return;
+  state_->finished = true;
+  state_->host.call_finished(state_->native.handles);
+}
+
 }  // namespace zul_host

@@ -39,6 +39,9 @@ struct HostConfig {
   // of size limits that must refuse before reading (a read past the real
   // bytes is what the sanitizers then report).
   std::map<std::string, std::int64_t, std::less<>> claimed_lengths;
+  // Bench mode: destroyed objects and disposed records are freed at once,
+  // neither poisoned nor kept in quarantine, as a host does; counts stay.
+  bool bench = false;
 };
 
 struct RegisteredMethod {
@@ -154,6 +157,9 @@ class Host {
   // What the plug-in asked for: resolver look-ups and service calls by name.
   int lookups(std::string_view service) const;
   int service_calls(std::string_view service) const;
+  // Text conversions the host itself performed for the plug-in, by
+  // "from to to" label ("UTF-16 to UTF-8"), with their counts.
+  std::map<std::string, long> conversions() const;
 
   // For callers that call a registered function through a pointer of their
   // own (Host::call, the dynamic call of zul). call_started() marks this

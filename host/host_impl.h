@@ -90,6 +90,7 @@ struct HostState {
   std::map<std::thread::id, ThreadState> threads;
   std::map<std::string, int, std::less<>> lookup_counts;
   std::map<std::string, int, std::less<>> call_counts;
+  std::map<std::pair<std::uint32_t, std::uint32_t>, long> conversions;  // (from, to) -> count
   // Declarations already checked by Host::call: function and parsed form.
   std::unordered_map<std::string, std::pair<void*, Declaration>> checked;
 
@@ -97,6 +98,9 @@ struct HostState {
   ThreadState& this_thread() { return threads[std::this_thread::get_id()]; }
   void problem(std::string text) { this_thread().problems.push_back(std::move(text)); }
   void count_call(std::string_view service);
+  void count_conversion(std::uint32_t from, std::uint32_t to) {
+    if (from != to) ++conversions[{from, to}];
+  }
   HostObject* make(Kind kind, const char* made_by);
   HostObject* make_string(std::string_view bytes, std::uint32_t encoding, const char* made_by);
   // The live object behind handle, of the given kind, or null after

@@ -56,6 +56,7 @@ REALstring convert_string(REALstring s, std::uint32_t encoding) {
     if (!o) return nullptr;
     auto text = convert_text(o->bytes, o->encoding, encoding);
     if (!text) return nullptr;
+    h.count_conversion(o->encoding, encoding);
     return reinterpret_cast<REALstring>(h.make_string(*text, encoding, "REALConvertString"));
   });
 }
@@ -73,6 +74,7 @@ bool get_string_data(REALstring s, std::uint32_t encoding, REALstringData* recor
       HostObject* o = h.check(s, Kind::string, "PluginGetStringData");
       if (!o) return false;
       text = convert_text(o->bytes, o->encoding, encoding);
+      if (text) h.count_conversion(o->encoding, encoding);
       string_id = o->id;
     }
     if (!text) return false;
@@ -114,6 +116,10 @@ void dispose_string_data(REALstringData* record) {
     it->second.disposed = true;
     h.open_records.erase(id);
     it->second.buffer.reset();
+    if (h.config.bench) {
+      h.records.erase(id);
+      return;
+    }
     h.disposed_records.push_back(id);
     while (h.disposed_records.size() > kQuarantine) {
       h.records.erase(h.disposed_records.front());
@@ -191,3 +197,16 @@ void* text_service(std::string_view name) {
 }
 
 }  // namespace zul_host::detail
+
+namespace zul_host {
+
+std::map<std::string, long> Host::conversions() const {
+  std::lock_guard lock(impl_->mu);
+  std::map<std::string, long> out;
+  for (const auto& [from_to, count] : impl_->conversions) {
+    out[encoding_label(from_to.first) + " to " + encoding_label(from_to.second)] += count;
+  }
+  return out;
+}
+
+}  // namespace zul_host

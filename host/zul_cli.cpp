@@ -14,6 +14,7 @@
 
 #include "common/hex_digits.h"
 #include "host/text_convert.h"
+#include "host/zul_bench.h"
 
 namespace zul_host {
 
@@ -24,6 +25,7 @@ namespace {
 constexpr std::string_view kUsage =
     "usage: zul [--plugin PATH] [--host-version V|none] [--verbose] list\n"
     "       zul [--plugin PATH] [--host-version V|none] [--verbose] call NAME ARG...\n"
+    "       zul [--plugin PATH] [--host-version V|none] bench [--seconds S] [--json] NAME ARG...\n"
     "options may stand anywhere; after a lone -- every word is an argument\n"
     "string, memoryblock and ptr arguments: TEXT, hex:C3A9, file:PATH, @null,\n"
     "  or utf8: utf16: utf32: latin1: cp1252: macroman: ascii: followed by TEXT\n";
@@ -287,6 +289,8 @@ struct CommandLine {
   std::string plugin;
   HostConfig config;
   bool verbose = false;
+  double seconds = 1.0;            // bench: how long to repeat the call
+  bool json = false;               // bench: one JSON object a line
   std::vector<std::string> words;  // the sub-command, then its arguments
 };
 
@@ -298,6 +302,16 @@ bool read_option(const std::vector<std::string>& args, std::size_t& i, CommandLi
   const bool has_value = i + 1 < args.size();
   if (option == "--verbose") {
     line.verbose = true;
+  } else if (option == "--json") {
+    line.json = true;
+  } else if (option == "--seconds" && has_value) {
+    const auto parsed = parse_argument(ValueType::double_, args[++i]);
+    if (!parsed || !(parsed->real > 0 && parsed->real <= 3600)) {
+      err << "zul: --seconds wants a number of seconds above 0, not '" << args[i] << "'\n"
+          << kUsage;
+      return false;
+    }
+    line.seconds = parsed->real;
   } else if (option == "--plugin" && has_value) {
     line.plugin = args[++i];
   } else if (option == "--host-version" && has_value) {
@@ -332,7 +346,8 @@ bool read_command_line(const std::vector<std::string>& args, CommandLine& line, 
     }
   }
   const std::vector<std::string>& w = line.words;
-  if (w.empty() || (w[0] != "list" && w[0] != "call") || (w[0] == "call" && w.size() < 2)) {
+  const bool calls = !w.empty() && (w[0] == "call" || w[0] == "bench");
+  if (w.empty() || (w[0] != "list" && !calls) || (calls && w.size() < 2)) {
     err << kUsage;
     return false;
   }
@@ -397,29 +412,40 @@ int report_result(const Host& host, const DynamicValue& result, bool verbose, st
   return 0;
 }
 
-int call_by_name(Host& host, const std::string& name, const std::vector<std::string>& args,
-                 bool verbose, std::ostream& out, std::ostream& err) {
+// The arguments for name, or nullopt after reporting why there are none
+// (status 2).
+std::optional<std::pair<std::string, std::vector<DynamicValue>>> arguments_for(
+    const Host& host, const std::string& name, const std::vector<std::string>& args,
+    std::ostream& err) {
   // A broken hex: or file: form is wrong whatever the overload.
   for (std::size_t i = 0; i < args.size(); ++i) {
     if (const std::string problem = argument_problem(args[i]); !problem.empty()) {
       err << "zul: argument " << i + 1 << " (" << args[i] << "): " << problem << "\n";
-      return 2;
+      return std::nullopt;
     }
   }
   std::vector<DynamicValue> values;
   const auto declaration = choose_overload(host.registration(), name, args, values);
   if (!declaration) {
     report_no_overload(host.registration(), name, args, err);
-    return 2;
+    return std::nullopt;
   }
+  return std::make_pair(*declaration, std::move(values));
+}
+
+int call_by_name(Host& host, const std::string& name, const std::vector<std::string>& args,
+                 bool verbose, std::ostream& out, std::ostream& err) {
+  const auto chosen = arguments_for(host, name, args, err);
+  if (!chosen) return 2;
+  const auto& [declaration, values] = *chosen;
   DynamicValue result;
   try {
-    result = call_dynamic(host, *declaration, values);
+    result = call_dynamic(host, declaration, values);
   } catch (const std::exception& e) {
     err << "zul: " << e.what() << "\n";
     return 2;
   }
-  if (verbose) err << "zul: called " << *declaration << "\n";
+  if (verbose) err << "zul: called " << declaration << "\n";
   return report_result(host, result, verbose, out, err);
 }
 
@@ -430,6 +456,7 @@ int run_zul(const std::vector<std::string>& args, const std::string& default_plu
   CommandLine line;
   line.plugin = default_plugin;
   if (!read_command_line(args, line, err)) return 2;
+  line.config.bench = line.words[0] == "bench";
 
   Host host(line.config);
   try {
@@ -443,7 +470,17 @@ int run_zul(const std::vector<std::string>& args, const std::string& default_plu
     return 0;
   }
   const std::vector<std::string> call_args(line.words.begin() + 2, line.words.end());
-  return call_by_name(host, line.words[1], call_args, line.verbose, out, err);
+  if (line.words[0] == "call") {
+    return call_by_name(host, line.words[1], call_args, line.verbose, out, err);
+  }
+  const auto chosen = arguments_for(host, line.words[1], call_args, err);
+  if (!chosen) return 2;
+  try {
+    return bench_call(host, chosen->first, chosen->second, {line.seconds, line.json}, out, err);
+  } catch (const std::exception& e) {
+    err << "zul: " << e.what() << "\n";
+    return 2;
+  }
 }
 
 }  // namespace zul_host

@@ -52,7 +52,8 @@ std::optional<std::string> choose_overload(const Registration& registration, std
 // hex was chosen for a single value.
 std::string format_value(const DynamicValue& value, bool* as_hex = nullptr);
 
-// Runs zul with its arguments (without the program name). default_plugin is
+// Runs zul with its arguments (without the program name): list, call or
+// bench (host/zul_bench.h). default_plugin is
 // used when no --plugin option is given.
 int run_zul(const std::vector<std::string>& args, const std::string& default_plugin,
             std::ostream& out, std::ostream& err);

@@ -3,6 +3,7 @@
 // fake plug-in and once as the built program.
 #include <gtest/gtest.h>
 
+#include <algorithm>
 #include <cstdio>
 #include <sstream>
 
@@ -257,6 +258,29 @@ TEST(run_zul, bad_command_lines_are_reported_never_crash) {
   EXPECT_EQ(run_zul({"call", "CheckUTF8ZUL", "hex:41FF", "2", "?"}, ZUL_PLUGIN_PATH, out, err), 0)
       << err.str();
   EXPECT_EQ(out.str(), "A?\n");
+}
+
+// zul bench: one JSON object a line with the named keys, the text form
+// with its figures, and the statuses of a raising call and bad options.
+TEST(run_zul, bench_prints_figures_and_host_conversions) {
+  const ZulRun json = zul({"bench", "--seconds", "0.02", "--json", "FakeEchoZUL", "hello"});
+  ASSERT_EQ(json.status, 0) << json.err;
+  EXPECT_EQ(json.out.find("{\"name\":\"FakeEchoZUL\",\"calls\":"), 0u) << json.out;
+  for (const char* key : {"\"ns_per_call\":", "\"input_bytes\":5,",
+                          "\"gbps\":", "\"memcpy_gbps\":", "\"host_conversions\":{"}) {
+    EXPECT_NE(json.out.find(key), std::string::npos) << key << " in " << json.out;
+  }
+  EXPECT_EQ(std::count(json.out.begin(), json.out.end(), '\n'), 1);
+
+  const ZulRun text = zul({"bench", "FakeEchoZUL", "utf16:hi", "--seconds", "0.02"});
+  ASSERT_EQ(text.status, 0) << text.err;
+  EXPECT_NE(text.out.find("ns per call"), std::string::npos) << text.out;
+  EXPECT_NE(text.out.find("memcpy of as many bytes"), std::string::npos) << text.out;
+  EXPECT_NE(text.out.find("text conversions by the host per call:"), std::string::npos);
+
+  EXPECT_EQ(zul({"bench", "--seconds", "0.02", "FakeRaiseZUL", "boom"}).status, 1);
+  EXPECT_EQ(zul({"bench", "--seconds", "0", "FakeEchoZUL", "x"}).status, 2);
+  EXPECT_EQ(zul({"bench", "FakeEchoZUL", "hex:4"}).status, 2);
 }
 
 TEST(argument_problem, hex_and_file_forms) {
