@@ -66,7 +66,8 @@ features detect() noexcept {
   return f;
 }
 #else
-features detect() noexcept { return {}; }
+// Unused where compute() knows the levels without asking (arm64).
+[[maybe_unused]] features detect() noexcept { return {}; }
 #endif
 
 struct levels {
