@@ -65,6 +65,9 @@ features detect() noexcept {
   f.vbmi2 = f.avx512 && vbmi && vbmi2;
   return f;
 }
+#else
+// Unused where compute() knows the levels without asking (arm64).
+[[maybe_unused]] features detect() noexcept { return {}; }
 #endif
 
 struct levels {

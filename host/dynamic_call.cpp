@@ -47,6 +47,24 @@ ffi_type* result_ffi_type(ValueType type) {
   }
 }
 
+// A ptr argument points at a private copy of its bytes and nothing more, so
+// the integer right after it (its size) may not ask for more bytes than it
+// holds: the callee would read past them. Throws std::invalid_argument.
+void check_ptr_sizes(const Declaration& d, const std::vector<DynamicValue>& args) {
+  for (std::size_t i = 0; i + 1 < args.size(); ++i) {
+    if (args[i].type != ValueType::ptr || args[i + 1].type != ValueType::integer) continue;
+    const std::size_t held = args[i].block.null ? 0 : args[i].block.bytes.size();
+    const std::int64_t size = args[i + 1].integer;
+    if (size > 0 && static_cast<std::uint64_t>(size) > held) {
+      throw std::invalid_argument("argument " + std::to_string(i + 2) + " (" +
+                                  d.params[i + 1].name + "): " + std::to_string(size) +
+                                  " is more than the " + std::to_string(held) +
+                                  (held == 1 ? " byte" : " bytes") + " that argument " +
+                                  std::to_string(i + 1) + " (" + d.params[i].name + ") holds");
+    }
+  }
+}
+
 // The parsed declaration, after checking that it is registered and that
 // the arguments have its parameter types. Throws std::invalid_argument.
 Declaration checked_declaration(const Host& host, std::string_view declaration,
@@ -68,6 +86,7 @@ Declaration checked_declaration(const Host& host, std::string_view declaration,
                                   type_name(args[i].type));
     }
   }
+  check_ptr_sizes(*parsed, args);
   return *parsed;
 }
 

@@ -30,8 +30,9 @@ struct DynamicValue {
 // Calls the function registered under declaration. The result has the
 // declared result type; a raised exception is in host.last_exception() and
 // the ledger in host.last_ledger_report(), as after Host::call. Throws
-// std::invalid_argument when the declaration is not registered or the
-// arguments do not match its parameter types.
+// std::invalid_argument when the declaration is not registered, the
+// arguments do not match its parameter types, or the integer that follows a
+// ptr argument (its size) is larger than the bytes the ptr holds.
 DynamicValue call_dynamic(Host& host, std::string_view declaration,
                           const std::vector<DynamicValue>& args);
 

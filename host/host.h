@@ -108,6 +108,9 @@ class Host {
   const Registration& registration() const;
   // The native function registered under exactly this declaration, or null.
   void* find(std::string_view declaration) const;
+  // A symbol the loaded plug-in exports (dlsym), or null: for test builds
+  // of the plug-in that export controls besides REALPluginMain.
+  void* library_symbol(const char* name) const;
 
   // Typed call through the registered pointer. A converts to the native
   // argument type (Str -> REALstring, Block -> REALmemoryBlock, integers ->

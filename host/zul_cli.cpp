@@ -7,10 +7,12 @@
 #include <cerrno>
 #include <charconv>
 #include <cstdlib>
+#include <filesystem>
 #include <fstream>
 #include <iterator>
 #include <stdexcept>
 
+#include "common/hex_digits.h"
 #include "host/text_convert.h"
 
 namespace zul_host {
@@ -38,16 +40,52 @@ constexpr Prefix kPrefixes[] = {
 
 bool starts_with(std::string_view s, std::string_view p) { return s.substr(0, p.size()) == p; }
 
+// What is wrong with the digits of a "hex:" form, or "".
+std::string hex_problem(std::string_view hex) {
+  std::string problem;
+  for (std::size_t i = 0; i < hex.size() && problem.empty(); ++i) {
+    if (zul::is_hex_digit(hex[i])) continue;
+    problem.append("'").append(1, hex[i]).append("' at position ");
+    problem.append(std::to_string(i + 1)).append(" of the digits is not a hex digit");
+  }
+  if (problem.empty() && hex.size() % 2) {
+    problem.append("an odd number of hex digits (").append(std::to_string(hex.size())).append(")");
+  }
+  return problem;
+}
+
 std::optional<std::string> from_hex(std::string_view hex) {
-  if (hex.size() % 2) return std::nullopt;
+  if (!hex_problem(hex).empty()) return std::nullopt;
   std::string out;
   for (std::size_t i = 0; i < hex.size(); i += 2) {
-    unsigned value = 0;
-    const auto [end, ec] = std::from_chars(hex.data() + i, hex.data() + i + 2, value, 16);
-    if (ec != std::errc() || end != hex.data() + i + 2) return std::nullopt;
-    out += static_cast<char>(value);
+    out += static_cast<char>(zul::hex_value(hex[i]) << 4 | zul::hex_value(hex[i + 1]));
   }
   return out;
+}
+
+// What keeps the file at path from being read as an argument, or "".
+std::string file_problem(const std::string& path) {
+  std::error_code ec;
+  const auto status = std::filesystem::status(path, ec);
+  if (ec || !std::filesystem::exists(status)) return "no such file";
+  if (std::filesystem::is_directory(status)) return "is a directory, not a file";
+  if (!std::filesystem::is_regular_file(status)) return "is not a regular file";
+  return "";
+}
+
+// The bytes of a regular file; nullopt when it cannot be read. Reading a
+// directory or a vanishing file makes the stream throw: that is caught.
+std::optional<std::string> read_file(const std::string& path) {
+  if (!file_problem(path).empty()) return std::nullopt;
+  try {
+    std::ifstream in(path, std::ios::binary);
+    if (!in) return std::nullopt;
+    std::string bytes((std::istreambuf_iterator<char>(in)), std::istreambuf_iterator<char>());
+    if (in.bad()) return std::nullopt;
+    return bytes;
+  } catch (const std::exception&) {
+    return std::nullopt;
+  }
 }
 
 // Bytes and encoding for the string-like forms.
@@ -59,11 +97,9 @@ std::optional<Str> parse_bytes(std::string_view text) {
     return tagged(*bytes, kUnknown);
   }
   if (starts_with(text, "file:")) {
-    std::ifstream in(std::string(text.substr(5)), std::ios::binary);
-    if (!in) return std::nullopt;
-    return tagged(
-        std::string((std::istreambuf_iterator<char>(in)), std::istreambuf_iterator<char>()),
-        kUnknown);
+    auto bytes = read_file(std::string(text.substr(5)));
+    if (!bytes) return std::nullopt;
+    return tagged(std::move(*bytes), kUnknown);
   }
   for (const Prefix& p : kPrefixes) {
     if (starts_with(text, p.prefix)) {
@@ -102,11 +138,10 @@ bool printable_utf8(std::string_view s) {
 }
 
 std::string to_hex(std::string_view bytes) {
-  static constexpr char kDigits[] = "0123456789ABCDEF";
   std::string out;
   for (unsigned char c : bytes) {
-    out += kDigits[c >> 4];
-    out += kDigits[c & 15];
+    out += zul::kHexDigits[c >> 4];
+    out += zul::kHexDigits[c & 15];
   }
   return out;
 }
@@ -126,6 +161,15 @@ std::string format_bytes(std::string_view bytes, std::uint32_t encoding, bool* a
 }
 
 }  // namespace
+
+std::string argument_problem(std::string_view text) {
+  if (starts_with(text, "hex:")) return hex_problem(text.substr(4));
+  if (starts_with(text, "file:")) {
+    const std::string path(text.substr(5));
+    return file_problem(path);
+  }
+  return "";
+}
 
 std::optional<DynamicValue> parse_argument(ValueType type, std::string_view text) {
   DynamicValue v;
@@ -295,19 +339,38 @@ bool read_command_line(const std::vector<std::string>& args, CommandLine& line, 
   return true;
 }
 
+// Why args do not fit d: the first argument that is missing, extra or not
+// of its parameter's type.
+std::string mismatch(const Declaration& d, const std::vector<std::string>& args) {
+  if (args.size() > d.params.size()) {
+    return "takes " + std::to_string(d.params.size()) + " arguments, given " +
+           std::to_string(args.size());
+  }
+  for (std::size_t i = 0; i < d.params.size(); ++i) {
+    const Parameter& p = d.params[i];
+    const std::string which = "argument " + std::to_string(i + 1) + " (" + p.name + ")";
+    if (i >= args.size()) {
+      if (!p.default_value) return which + " is missing";
+      continue;
+    }
+    if (!parse_argument(p.type, args[i])) {
+      return which + ": '" + args[i] + "' is not a valid " + type_name(p.type);
+    }
+  }
+  return "";
+}
+
 void report_no_overload(const Registration& registration, const std::string& name,
-                        std::ostream& err) {
-  std::vector<std::string> candidates;
+                        const std::vector<std::string>& args, std::ostream& err) {
+  bool any = false;
   for (const RegisteredMethod& m : registration.methods) {
     const auto d = parse_declaration(m.declaration);
-    if (d && d->name == name) candidates.push_back(m.declaration);
+    if (!d || d->name != name) continue;
+    if (!any) err << "zul: these arguments fit no overload of " << name << ":\n";
+    any = true;
+    err << "  " << m.declaration << "\n    " << mismatch(*d, args) << "\n";
   }
-  if (candidates.empty()) {
-    err << "zul: no function named " << name << " (see zul list)\n";
-    return;
-  }
-  err << "zul: these arguments fit no overload of " << name << ":\n";
-  for (const std::string& c : candidates) err << "  " << c << "\n";
+  if (!any) err << "zul: no function named " << name << " (see zul list)\n";
 }
 
 // Prints the result (and, when asked or when it is hex, what it is) and
@@ -336,10 +399,17 @@ int report_result(const Host& host, const DynamicValue& result, bool verbose, st
 
 int call_by_name(Host& host, const std::string& name, const std::vector<std::string>& args,
                  bool verbose, std::ostream& out, std::ostream& err) {
+  // A broken hex: or file: form is wrong whatever the overload.
+  for (std::size_t i = 0; i < args.size(); ++i) {
+    if (const std::string problem = argument_problem(args[i]); !problem.empty()) {
+      err << "zul: argument " << i + 1 << " (" << args[i] << "): " << problem << "\n";
+      return 2;
+    }
+  }
   std::vector<DynamicValue> values;
   const auto declaration = choose_overload(host.registration(), name, args, values);
   if (!declaration) {
-    report_no_overload(host.registration(), name, err);
+    report_no_overload(host.registration(), name, args, err);
     return 2;
   }
   DynamicValue result;

@@ -2,8 +2,10 @@
 // them by name with arguments written on the command line, through the
 // stand-in host. Kept apart from tools/zul.cpp so tests can run it in
 // process. Exit statuses: 0 success, 1 a host exception was raised, 2 usage
-// error (unknown name, arguments that fit no overload, bad options), 3 the
-// plug-in could not be loaded or the call left the host's ledger unbalanced.
+// error (unknown name, arguments that fit no overload, an argument that
+// cannot be read, a ptr size beyond its bytes, bad options), each with a
+// message naming the argument; 3 the plug-in could not be loaded or the
+// call left the host's ledger unbalanced. No command line crashes it.
 #pragma once
 
 #include <cstdint>
@@ -27,6 +29,11 @@ namespace zul_host {
 // decimal integer literal; double any number strtod reads completely;
 // boolean true, false, 1 or 0 (any case).
 std::optional<DynamicValue> parse_argument(ValueType type, std::string_view text);
+
+// What is wrong with a "hex:" or "file:" argument whatever its type (a
+// non-hex digit, an odd count of digits, a missing file, a directory), or
+// "" when nothing is (also for every other form).
+std::string argument_problem(std::string_view text);
 
 // The declaration to call for name and these arguments: among the
 // registered declarations with that name and that many parameters, the

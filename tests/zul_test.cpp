@@ -213,6 +213,60 @@ TEST(run_zul, statuses_and_output) {
   EXPECT_EQ(list.out.substr(0, list.out.find('\n')), "FakeEchoZUL(s as string) as string");
 }
 
+// Command lines that used to end the process (an uncaught stream exception
+// for a directory, a segmentation fault for a ptr size beyond its bytes) or
+// to blame the overloads: each gives status 2 and names the argument.
+TEST(run_zul, bad_command_lines_are_reported_never_crash) {
+  const std::string dir = ::testing::TempDir();
+  struct {
+    std::vector<std::string> args;
+    std::string want_err_part;
+    const char* why;
+  } rows[] = {
+      {{"call", "EncodingToHexZUL", "file:" + dir},
+       "argument 1 (file:" + dir + "): is a directory",
+       "a directory for file:"},
+      {{"call", "EncodingToHexZUL", "file:" + dir + "/zul-no-such-file"},
+       "no such file",
+       "a missing file"},
+      {{"call", "EncodingToHexZUL", "file:/dev/null"}, "not a regular file", "a device"},
+      {{"call", "CheckUTF8ZUL", "hex:41", "100000000", "?"},
+       "argument 2 (size): 100000000 is more than the 1 byte that argument 1 (data) holds",
+       "ptr size beyond the bytes given"},
+      {{"call", "GetStringsFromDataZUL", "hex:4142", "3", "0"},
+       "more than the 2 bytes",
+       "ptr size one past the bytes"},
+      {{"call", "EncodingToHexZUL", "hex:4G"},
+       "'G' at position 2 of the digits is not a hex digit",
+       "a non-hex digit"},
+      {{"call", "EncodingToHexZUL", "hex:414"}, "an odd number of hex digits (3)", "odd digits"},
+      {{"call", "StringXORZUL", "a", "b", "x"},
+       "argument 3 (MaskOffset): 'x' is not a valid",
+       "an integer that is none"},
+      {{"call", "InStrBytesZUL", "a"}, "argument 2 (find) is missing", "too few arguments"},
+      {{"call", "InStrBytesZUL", "a", "b", "c"}, "takes 2 arguments, given 3", "too many"},
+  };
+  for (const auto& row : rows) {
+    SCOPED_TRACE(row.why);
+    std::ostringstream out, err;
+    EXPECT_EQ(run_zul(row.args, ZUL_PLUGIN_PATH, out, err), 2);
+    EXPECT_NE(err.str().find(row.want_err_part), std::string::npos) << err.str();
+    EXPECT_EQ(out.str(), "");
+  }
+  std::ostringstream out, err;
+  EXPECT_EQ(run_zul({"call", "CheckUTF8ZUL", "hex:41FF", "2", "?"}, ZUL_PLUGIN_PATH, out, err), 0)
+      << err.str();
+  EXPECT_EQ(out.str(), "A?\n");
+}
+
+TEST(argument_problem, hex_and_file_forms) {
+  EXPECT_EQ(argument_problem("hex:C3a9"), "");
+  EXPECT_EQ(argument_problem("hex:"), "");
+  EXPECT_EQ(argument_problem("plain text"), "");
+  EXPECT_EQ(argument_problem("hex:0x"), "'x' at position 2 of the digits is not a hex digit");
+  EXPECT_EQ(argument_problem("file:/dev/null"), "is not a regular file");
+}
+
 TEST(zul_tool, runs_as_a_program) {
   const std::string command = std::string(ZUL_TOOL_PATH) + " --plugin " + ZUL_FAKE_PLUGIN_PATH +
                               " call FakeEchoZUL 'two words' 2>/dev/null";

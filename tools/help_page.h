@@ -18,7 +18,8 @@ struct entry {
   std::string declaration;  // exactly as registered with the host
   std::string summary, arguments, result, raises;
   std::vector<std::string> example;  // lines of code in the host's BASIC
-  std::string anchor;                // unique id within the page
+  std::string unchecked;  // why a result stated in the example cannot be evaluated; not shown
+  std::string anchor;     // unique id within the page
 };
 
 struct parsed {
@@ -61,11 +62,12 @@ inline std::string apply_field(entry& e, std::string_view raw, std::string_view 
     last = nullptr;
     return "";
   }
-  std::string* field = key == "summary"  ? &e.summary
-                       : key == "args"   ? &e.arguments
-                       : key == "result" ? &e.result
-                       : key == "raises" ? &e.raises
-                                         : nullptr;
+  std::string* field = key == "summary"     ? &e.summary
+                       : key == "args"      ? &e.arguments
+                       : key == "result"    ? &e.result
+                       : key == "raises"    ? &e.raises
+                       : key == "unchecked" ? &e.unchecked
+                                            : nullptr;
   if (!field) return "unknown field \"" + std::string(key) + "\"";
   *field = std::string(trim(line.substr(colon + 1)));
   last = field;
@@ -91,8 +93,10 @@ inline std::string finish_entries(std::vector<entry>& entries) {
 
 // Parses the help source. Lines: "# ..." comment, "== Family" starts a
 // family, "@ <declaration>" starts an entry, "summary:", "args:",
-// "result:", "raises:" set a field (a field may continue on lines that
-// start with a blank), "example:" adds one line of example code. Every
+// "result:", "raises:", "unchecked:" set a field (a field may continue on
+// lines that start with a blank), "example:" adds one line of example
+// code. "unchecked:" says why a result an example states in a "//" comment
+// cannot be evaluated by the example test; it is not rendered. Every
 // entry needs summary, result and example; anything else is an error
 // naming its line.
 inline parsed parse_help(std::string_view source) {
@@ -114,7 +118,7 @@ inline parsed parse_help(std::string_view source) {
     } else if (line.starts_with("@ ")) {
       if (family.empty()) error = "entry before any \"== \" family";
       out.entries.push_back(
-          {family, std::string(detail::trim(line.substr(2))), {}, {}, {}, {}, {}, {}});
+          {family, std::string(detail::trim(line.substr(2))), {}, {}, {}, {}, {}, {}, {}});
       last = nullptr;
     } else if (out.entries.empty()) {
       error = "field before any \"@ \" entry";
