@@ -71,6 +71,19 @@ constexpr simd::byte_set kPercentPlus =
 // a few after a long run.
 constexpr std::size_t kAfterMin = 8, kAfterMax = 512, kShortRun = 16;
 
+// The exact encoded length, or nothing once it passes limit. Only inputs
+// whose worst case passes the limit pay for this pass, so an oversized
+// result is refused before any of it is written.
+bool encoded_size_fits(const escape_table& table, const std::uint8_t* p, std::size_t n,
+                       std::uint64_t limit) {
+  std::uint64_t size = 0;
+  for (std::size_t i = 0; i < n; ++i) {
+    size += table[p[i]].length;
+    if (size > limit) return false;
+  }
+  return true;
+}
+
 }  // namespace
 
 out_buffer encode_url(std::string_view in, std::int64_t options, std::uint64_t limit,
@@ -79,6 +92,9 @@ out_buffer encode_url(std::string_view in, std::int64_t options, std::uint64_t l
   const auto* p = reinterpret_cast<const std::uint8_t*>(in.data());
   const std::size_t n = in.size();
   if (!fits_result(n, limit)) return out_buffer(0);  // every byte gives at least one
+  if (!fits_result(3 * std::uint64_t{n}, limit) && !encoded_size_fits(table, p, n, limit)) {
+    return out_buffer(0);
+  }
   out_buffer out(worst_case_reserve(n, 3, 10, limit) + out_buffer::kSlack, limit);
   std::size_t i = 0;
   std::size_t after = kAfterMin;

@@ -1,6 +1,7 @@
-// The replaced global operator new / delete behind fail_allocations. Only
-// the plain and array forms are replaced; the library's defaults of the
-// nothrow forms call them, and the aligned forms keep their own pairing.
+// The replaced global operator new / delete behind fail_allocations: the
+// plain, array and nothrow forms, so every one of them pairs with the same
+// free (a sanitizer runtime brings its own nothrow forms otherwise). The
+// aligned forms keep their own pairing.
 #include "tests/failing_allocator.h"
 
 #include <cstdlib>
@@ -23,7 +24,23 @@ fail_allocations::~fail_allocations() { --failing; }
 
 void* operator new(std::size_t size) { return allocate(size); }
 void* operator new[](std::size_t size) { return allocate(size); }
+void* operator new(std::size_t size, const std::nothrow_t&) noexcept {
+  try {
+    return allocate(size);
+  } catch (...) {
+    return nullptr;
+  }
+}
+void* operator new[](std::size_t size, const std::nothrow_t&) noexcept {
+  try {
+    return allocate(size);
+  } catch (...) {
+    return nullptr;
+  }
+}
 void operator delete(void* p) noexcept { std::free(p); }
 void operator delete[](void* p) noexcept { std::free(p); }
 void operator delete(void* p, std::size_t) noexcept { std::free(p); }
 void operator delete[](void* p, std::size_t) noexcept { std::free(p); }
+void operator delete(void* p, const std::nothrow_t&) noexcept { std::free(p); }
+void operator delete[](void* p, const std::nothrow_t&) noexcept { std::free(p); }
