@@ -15,6 +15,7 @@
 #include "common/byte_set.h"
 #include "encodings/yenc_kernels.h"
 #include "search/count_kernels.h"
+#include "text/char_class_kernels.h"
 
 namespace {
 
@@ -133,6 +134,17 @@ void xor_run_bench(benchmark::State& state, isa level) {
   set_bytes(state);
 }
 
+void replace_non_printable_bench(benchmark::State& state, isa level) {
+  const auto& k = kernels_for(zul::text::detail::char_class_tables(), level);
+  const auto& in = text(state.range(0));
+  std::vector<std::uint8_t> out(in.size());
+  for (auto _ : state) {
+    k.replace_non_printable(in.data(), in.size(), '.', out.data());
+    benchmark::ClobberMemory();
+  }
+  set_bytes(state);
+}
+
 void sizes(benchmark::internal::Benchmark* b) { b->Arg(1 << 10)->Arg(1 << 20)->Arg(64 << 20); }
 
 const bool registered = [] {
@@ -152,6 +164,8 @@ const bool registered = [] {
     sizes(benchmark::RegisterBenchmark(("decode_hex/" + name).c_str(), decode_hex_bench, level));
     sizes(benchmark::RegisterBenchmark(("decode_yenc/" + name).c_str(), decode_yenc_bench, level));
     sizes(benchmark::RegisterBenchmark(("xor_run/" + name).c_str(), xor_run_bench, level));
+    sizes(benchmark::RegisterBenchmark(("replace_non_printable/" + name).c_str(),
+                                       replace_non_printable_bench, level));
   }
   return true;
 }();

@@ -1,7 +1,9 @@
 // Readable units are classified by one 256-entry table on their first byte:
 // single-byte units, lead bytes with the allowed range of their second byte
 // (Unicode Table 3-7, well-formed UTF-8 byte sequences), and bytes that end a
-// run. Later bytes of a multi-byte unit are always 0x80..0xBF.
+// run. Later bytes of a multi-byte unit are always 0x80..0xBF. A run that
+// goes on past its first bytes is measured by byte-set searches over its
+// ASCII stretches.
 #include "binary/readable_runs.h"
 
 #include <array>
@@ -22,14 +24,32 @@ constexpr std::array<utf8_lead, 256> kUnits = [] {
   return t;
 }();
 
+// Bytes that are not a one-byte unit: they end an ASCII stretch.
+constexpr simd::byte_set kEndsAscii =
+    byte_set_where([](std::uint8_t b) { return kUnits[b].length != 1; });
+
+// Bytes judged one by one before a byte-set search is worth its cost
+// (binary data mostly has short runs).
+constexpr std::size_t kScalarFirst = 32;
+
 }  // namespace
 
-run_measure measure_run(std::span<const std::uint8_t> data, std::size_t pos) {
+run_measure measure_run(std::span<const std::uint8_t> data, std::size_t pos,
+                        const scan_kernels& scan) {
   const std::uint8_t* d = data.data();
   const std::size_t n = data.size();
   std::size_t i = pos;
   bool visible = false;
+  std::size_t search_from = pos + kScalarFirst;
   while (i < n) {
+    if (i >= search_from) {
+      // A long run: the ASCII stretch ahead in one search.
+      const std::size_t stretch = scan.find_first(kEndsAscii, d + i, n - i);
+      for (std::size_t k = i; !visible && k < i + stretch; ++k) visible = d[k] > 0x20;
+      i += stretch;
+      search_from = i + kScalarFirst;
+      if (i == n) break;
+    }
     const std::uint8_t b = d[i];
     const utf8_lead unit = kUnits[b];
     if (unit.length == 1) {

@@ -9,6 +9,8 @@
 #include <cstdint>
 #include <span>
 
+#include "common/scan.h"
+
 namespace zul::binary {
 
 namespace detail {
@@ -21,7 +23,9 @@ struct run_measure {
 // The readable run that starts at data[pos] (pos < data.size()): it ends at
 // the first byte that does not begin a readable unit, or before a
 // multi-byte unit that is malformed or cut by the end of the data.
-run_measure measure_run(std::span<const std::uint8_t> data, std::size_t pos);
+// scan is the byte-set search to use (tests pass every level's).
+run_measure measure_run(std::span<const std::uint8_t> data, std::size_t pos,
+                        const scan_kernels& scan = machine_scan());
 
 }  // namespace detail
 
@@ -31,11 +35,11 @@ run_measure measure_run(std::span<const std::uint8_t> data, std::size_t pos);
 // as 0). The byte that ends a run is skipped with it.
 template <class OnRun>
 void for_each_readable_run(std::span<const std::uint8_t> data, std::int64_t min_length,
-                           OnRun&& on_run) {
+                           OnRun&& on_run, const scan_kernels& scan = machine_scan()) {
   const std::uint64_t threshold = min_length < 0 ? 0 : static_cast<std::uint64_t>(min_length);
   std::size_t p = 0;
   while (p < data.size()) {
-    const detail::run_measure run = detail::measure_run(data, p);
+    const detail::run_measure run = detail::measure_run(data, p, scan);
     if (run.length == 0) {
       ++p;
       continue;

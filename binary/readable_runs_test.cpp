@@ -7,6 +7,9 @@
 #include <string>
 #include <string_view>
 
+#include "common/cpu.h"
+#include "tests/sweep.h"
+
 namespace zul::binary {
 namespace {
 
@@ -63,6 +66,32 @@ TEST(measure_run, agrees_with_decoding_model) {
         }
       }
     }
+  }
+}
+
+bool model_visible(std::string_view run) {
+  for (const char c : run) {
+    if (static_cast<unsigned char>(c) > 0x20) return true;
+  }
+  return false;
+}
+
+// Runs long enough for the byte-set searches, with a byte that ends or
+// continues them at every position, on every search level.
+TEST(measure_run, every_scan_level_with_an_ending_byte_everywhere) {
+  const std::string specials("\x00\x1F\x7F\x80\xC3 \n\xFF", 8);
+  for (const simd::isa level : simd::supported_isas()) {
+    SCOPED_TRACE(simd::isa_name(level));
+    testing_sweep::special_byte_sweep(specials, 100, [&](const std::string& in) {
+      for (const std::string& s : {in, in + "\xC3\xA9" + in, std::string(70, ' ') + in}) {
+        for (std::size_t pos = 0; pos < s.size() && pos < 2; ++pos) {
+          const detail::run_measure got = detail::measure_run(bytes(s), pos, scan_for(level));
+          const std::string_view from = std::string_view(s).substr(pos);
+          ASSERT_EQ(got.length, model_run(from));
+          ASSERT_EQ(got.visible, model_visible(from.substr(0, got.length)));
+        }
+      }
+    });
   }
 }
 

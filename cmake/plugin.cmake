@@ -13,6 +13,12 @@ endforeach()
 
 add_library(zul_objects OBJECT ${ZUL_SOURCES})
 target_include_directories(zul_objects PUBLIC ${PROJECT_SOURCE_DIR})
+# Fuzzing builds instrument the library itself for coverage; libFuzzer in
+# the fuzz target supplies the callbacks.
+option(ZUL_LIBFUZZER "Build fuzz targets with libFuzzer and instrument the library (clang)" OFF)
+if(ZUL_LIBFUZZER)
+  target_compile_options(zul_objects PRIVATE -fsanitize=fuzzer-no-link)
+endif()
 
 add_library(zul_core STATIC $<TARGET_OBJECTS:zul_objects>)
 target_include_directories(zul_core PUBLIC ${PROJECT_SOURCE_DIR})
@@ -30,6 +36,9 @@ if(CMAKE_SYSTEM_NAME STREQUAL "Linux")
     "LINKER:--version-script=${PROJECT_SOURCE_DIR}/cmake/exports.map"
     "LINKER:--exclude-libs,ALL")
   if(NOT ZUL_SANITIZE)
-    target_link_options(StringGlobalsZUL PRIVATE -static-libstdc++ -static-libgcc "LINKER:--no-undefined")
+    target_link_options(StringGlobalsZUL PRIVATE -static-libstdc++ -static-libgcc)
+    if(NOT ZUL_LIBFUZZER)  # the coverage callbacks come from the fuzz target
+      target_link_options(StringGlobalsZUL PRIVATE "LINKER:--no-undefined")
+    endif()
   endif()
 endif()

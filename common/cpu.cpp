@@ -65,8 +65,6 @@ features detect() noexcept {
   f.vbmi2 = f.avx512 && vbmi && vbmi2;
   return f;
 }
-#else
-features detect() noexcept { return {}; }
 #endif
 
 struct levels {

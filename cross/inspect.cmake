@@ -1,8 +1,10 @@
 # Inspects one built plug-in library with the LLVM tools and fails unless it
 # is what the host loads on its platform: the right file type and
 # architecture, exactly one exported symbol (REALPluginMain), system
-# libraries only, and the promised minimum OS version. Run with cmake -P:
-#   -DPLATFORM="Mac x86-64" -DLIBRARY=/path/to/StringGlobalsZUL.dylib
+# libraries only, and the promised minimum OS version; for Mach-O also the
+# loader's checks of macho_check (libSystem only, arm64 signature). Run with
+# cmake -P:
+#   -DPLATFORM="Mac x86-64" -DLIBRARY=/path/to/StringGlobalsZUL.dylib -DMACHO_CHECK=<macho_check>
 cmake_minimum_required(VERSION 3.25)
 
 function(run out)
@@ -66,6 +68,11 @@ if(PLATFORM MATCHES "^Mac")
     expect("${arch} dependencies" "${deps}" "/usr/lib/libSystem.B.dylib")
   endforeach()
   set(min "${min_list}")
+  # Every load command and the arm64 code signature, page by page.
+  run(macho "${MACHO_CHECK}" "${LIBRARY}")
+  string(STRIP "${macho}" macho)
+  string(REPLACE "\n" " / " macho "${macho}")
+  string(APPEND min " - ${macho}")
 
 elseif(PLATFORM MATCHES "^Windows")
   if(PLATFORM MATCHES "x86-64")
@@ -112,7 +119,7 @@ elseif(PLATFORM MATCHES "^Linux")
   matches(deps "${needed}" "\n +([^\n]+\\.so[.0-9]*)")
   foreach(lib IN LISTS deps)
     # glibc only: libc and libm, its dynamic loader, and libdl and libpthread,
-    # which glibc kept apart from libc until 2.34 (the arm64 build targets 2.17).
+    # which glibc kept apart from libc until 2.34 (both builds target 2.17).
     if(NOT lib MATCHES "^(libc\\.so\\.6|libm\\.so\\.6|libdl\\.so\\.2|libpthread\\.so\\.0|ld-linux-(x86-64|aarch64)\\.so\\.[12])$")
       message(FATAL_ERROR "${PLATFORM}: depends on ${lib}, not a part of glibc")
     endif()
@@ -124,7 +131,7 @@ elseif(PLATFORM MATCHES "^Linux")
   list(SORT glibc COMPARE NATURAL ORDER DESCENDING)
   list(GET glibc 0 newest)
   set(min "glibc ${newest}")
-  if(PLATFORM MATCHES "arm64" AND newest VERSION_GREATER "2.17")
+  if(newest VERSION_GREATER "2.17")
     message(FATAL_ERROR "${PLATFORM}: needs glibc ${newest}, expected 2.17 at most")
   endif()
 else()

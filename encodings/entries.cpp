@@ -7,6 +7,7 @@
 // Nothing here keeps state between calls, so calls from several threads
 // are independent.
 #include <cstdint>
+#include <new>
 #include <string>
 #include <vector>
 
@@ -162,6 +163,7 @@ REALstring EncodeEmailSubjectZUL(REALstring s) noexcept {
     rbText text(s);
     const std::string_view utf8 = text.utf8();
     if (text.host_failed()) return nullptr;
+    if (text.out_of_memory()) throw std::bad_alloc();  // not the empty subject
     if (!enc::subject_needs_encoding(utf8)) return same_string(s);
     return build_string(enc::encode_mail_subject(utf8), kASCII);
   });
@@ -184,13 +186,17 @@ REALmemoryBlock yDecodeZULm(REALmemoryBlock data) noexcept {
   });
 }
 
-// Tag removal over the UTF-8 text; the replacement is read as UTF-8 too.
+// Tag removal over the UTF-8 text; the replacement is read as UTF-8 too. A
+// text that could not be copied for want of memory is reported as such
+// rather than read as empty (which would drop the replacement).
 REALstring RemoveHTMLTagsWith(REALstring s, REALstring replacement) noexcept {
   if (!s) return nullptr;
   return trapped<REALstring>(nullptr, [&] {
     rbText text(s);
     rbText with(replacement);
-    return build_string(enc::remove_html_tags(text.utf8(), with.utf8()), kUTF8);
+    const std::string_view utf8 = text.utf8(), with_utf8 = with.utf8();
+    if (text.out_of_memory() || with.out_of_memory()) throw std::bad_alloc();
+    return build_string(enc::remove_html_tags(utf8, with_utf8), kUTF8);
   });
 }
 

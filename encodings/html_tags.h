@@ -7,15 +7,19 @@
 #include <string>
 #include <string_view>
 
-#include "common/size_gate.h"
+#include "common/out_buffer.h"
+#include "common/scan.h"
 
 namespace zul::encodings {
 
 // Drops zero bytes and the brackets themselves; writes other bytes when the
 // depth is exactly 0, and replacement (possibly empty) for each other byte,
-// so replacement appears once per byte inside a tag. Output that would pass
-// limit bytes gives "" (the removal stops there).
-std::string remove_html_tags(std::string_view utf8, std::string_view replacement,
-                             std::uint64_t limit = kMaxResultBytes);
+// so replacement appears once per byte inside a tag.
+// Output that would pass limit bytes gives "" (the removal stops there).
+// Throws std::bad_alloc when memory runs out. scan is the byte-set search to
+// use.
+out_buffer remove_html_tags(std::string_view utf8, std::string_view replacement,
+                            std::uint64_t limit = kMaxResultBytes,
+                            const scan_kernels& scan = machine_scan());
 
 }  // namespace zul::encodings

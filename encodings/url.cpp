@@ -1,15 +1,18 @@
-// Percent-encoding: one pass over the input into a buffer sized once for the
-// worst case (3 bytes per input byte). The encoder reads one of three
-// immutable 256-entry tables chosen by the options (options 0 and 3 share
-// one), so concurrent calls with different options never interfere. Runs of
-// bytes that need no change are copied whole in both directions.
+// Percent-encoding: one pass over the input into a buffer reserved once for
+// the worst case (3 bytes per input byte) and never zero-filled. A byte-set
+// search finds the next byte that needs work; the run before it is copied
+// whole, and that byte and the next few take the table one by one, more of
+// them while searches keep finding short runs, so text dense with escapes
+// does not pay a search per byte. The encoder reads
+// one of three immutable 256-entry tables chosen by the options (options 0
+// and 3 share one), so concurrent calls with different options never
+// interfere.
 #include "encodings/url.h"
 
 #include <array>
 #include <cstring>
 
 #include "common/hex_digits.h"
-#include "common/size_gate.h"
 
 namespace zul::encodings {
 namespace {
@@ -55,86 +58,76 @@ const escape_table& table_for(std::int64_t options) {
   }
 }
 
-// Bytes that the encoder copies unchanged whatever the options.
-constexpr std::array<bool, 256> kKeep = [] {
-  std::array<bool, 256> keep{};
-  for (unsigned b = 0; b < 256; ++b) keep[b] = is_unreserved(b);
-  return keep;
-}();
+// Bytes that the encoder may change (whether they do depends on the options).
+constexpr simd::byte_set kNeedsWork =
+    byte_set_where([](std::uint8_t b) { return !is_unreserved(b); });
 
-// The exact encoded size of in, counted only when its worst case passes the
-// limit; 0 (with the output's size unknown) once the count passes it.
-std::uint64_t encoded_size(const escape_table& table, std::string_view in, std::uint64_t limit) {
-  std::uint64_t total = 0;
-  for (const char c : in) {
-    total += table[static_cast<std::uint8_t>(c)].length;
-    if (total > limit) return 0;
-  }
-  return total;
-}
+constexpr simd::byte_set kPercent = byte_set_where([](std::uint8_t b) { return b == '%'; });
+constexpr simd::byte_set kPercentPlus =
+    byte_set_where([](std::uint8_t b) { return b == '%' || b == '+'; });
+
+// Bytes taken one by one after a byte that needs work: a few, doubling
+// while searches keep finding short runs (text dense with escapes), back to
+// a few after a long run.
+constexpr std::size_t kAfterMin = 8, kAfterMax = 512, kShortRun = 16;
 
 }  // namespace
 
-std::string encode_url(std::string_view in, std::int64_t options, std::uint64_t limit) {
+out_buffer encode_url(std::string_view in, std::int64_t options, std::uint64_t limit,
+                      const scan_kernels& scan) {
   const escape_table& table = table_for(options);
   const auto* p = reinterpret_cast<const std::uint8_t*>(in.data());
   const std::size_t n = in.size();
-  // 3 bytes per input byte. Only when that worst case passes the limit is the
-  // exact size counted first; an output past the limit is never allocated.
-  std::uint64_t room = result_size(limit).add_times(3, n).bytes();
-  if (room == 0 && n != 0) {
-    if (!fits_result(n, limit)) return {};  // every byte gives at least one
-    room = encoded_size(table, in, limit);
-    if (room == 0) return {};
-  }
-  // Slack so each entry can be stored as 4 bytes.
-  std::string out(room + 10, '\0');
-  char* o = out.data();
+  if (!fits_result(n, limit)) return out_buffer(0);  // every byte gives at least one
+  out_buffer out(worst_case_reserve(n, 3, 10, limit) + out_buffer::kSlack, limit);
   std::size_t i = 0;
+  std::size_t after = kAfterMin;
   while (i < n) {
-    // Copy a run of bytes that stay as they are in one go.
-    std::size_t run = i;
-    while (run < n && kKeep[p[run]]) ++run;
-    if (run > i) {
-      std::memcpy(o, p + i, run - i);
-      o += run - i;
-      i = run;
-      if (i == n) break;
+    const std::size_t run = scan.find_first(kNeedsWork, p + i, n - i);
+    after = run < kShortRun ? (after < kAfterMax ? 2 * after : after) : kAfterMin;
+    // The run, then up to `after` entries of 3 bytes stored as 4.
+    if (!out.ensure(run + 3 * after + 1)) return out.discard();
+    out.put(p + i, run);
+    i += run;
+    if (i == n) break;
+    const std::size_t stop = n - i > after ? i + after : n;
+    std::uint8_t* const first = out.tail();
+    std::uint8_t* o = first;
+    for (; i < stop; ++i) {
+      const escape& e = table[p[i]];
+      std::memcpy(o, e.text, 4);
+      o += e.length;
     }
-    const escape& e = table[p[i++]];
-    std::memcpy(o, e.text, 4);
-    o += e.length;
+    out.commit(static_cast<std::size_t>(o - first));
   }
-  out.resize(static_cast<std::size_t>(o - out.data()));
+  if (!out.fits()) return out.discard();
   return out;
 }
 
-std::string decode_url(std::string_view in, std::int64_t options) {
+out_buffer decode_url(std::string_view in, std::int64_t options, const scan_kernels& scan) {
+  const auto* p = reinterpret_cast<const std::uint8_t*>(in.data());
   const std::size_t n = in.size();
-  std::string out(n, '\0');
-  char* o = out.data();
-  const char* p = in.data();
+  out_buffer out(n);  // never longer than the input
   const bool plus = plus_as_space(options);
+  const simd::byte_set& special = plus ? kPercentPlus : kPercent;
   std::size_t i = 0;
   while (i < n) {
-    // Copy everything up to the next "%" (or "+" when it means a space).
-    std::size_t run = i;
-    while (run < n && p[run] != '%' && !(plus && p[run] == '+')) ++run;
-    std::memcpy(o, p + i, run - i);
-    o += run - i;
-    i = run;
-    if (i == n) break;
-    if (p[i] == '+') {
-      *o++ = ' ';
-      ++i;
-      continue;
+    const std::size_t run = scan.find_first(special, p + i, n - i);
+    out.put(p + i, run);
+    i += run;
+    // Escapes back to back are decoded without a new search.
+    while (i < n && (p[i] == '%' || (plus && p[i] == '+'))) {
+      if (p[i] == '+') {
+        out.put_byte(' ');
+        ++i;
+        continue;
+      }
+      const unsigned high = i + 1 < n ? hex_value(static_cast<char>(p[i + 1])) : 0;
+      const unsigned low = i + 2 < n ? hex_value(static_cast<char>(p[i + 2])) : 0;
+      out.put_byte(static_cast<std::uint8_t>((high << 4) | low));
+      i += 3;
     }
-    const unsigned high = i + 1 < n ? hex_value(p[i + 1]) : 0;
-    const unsigned low = i + 2 < n ? hex_value(p[i + 2]) : 0;
-    *o++ = static_cast<char>((high << 4) | low);
-    i += 3;
   }
-  out.resize(static_cast<std::size_t>(o - out.data()));
   return out;
 }
 

@@ -9,7 +9,8 @@
 #include <string>
 #include <string_view>
 
-#include "common/size_gate.h"
+#include "common/out_buffer.h"
+#include "common/scan.h"
 
 namespace zul::encodings {
 
@@ -19,14 +20,18 @@ namespace zul::encodings {
 // The decoder turns "+" into a space when bit 0 is set.
 
 // Percent-encodes every byte of in. Output is at most 3 * size bytes; an
-// output longer than limit bytes gives "" without being allocated.
-std::string encode_url(std::string_view in, std::int64_t options,
-                       std::uint64_t limit = kMaxResultBytes);
+// output longer than limit bytes gives "" (room for it is reserved, never
+// touched). Throws std::bad_alloc when memory runs out. scan is the byte-set
+// search to use (tests pass every level's).
+out_buffer encode_url(std::string_view in, std::int64_t options,
+                      std::uint64_t limit = kMaxResultBytes,
+                      const scan_kernels& scan = machine_scan());
 
 // Decodes "%hh" sequences. Never rejects input: a non-hex digit counts as 0,
 // the two bytes after "%" are always consumed, and a "%" within the last two
 // bytes reads missing digits as 0 (nothing past the end is read). Output is
 // at most in.size() bytes.
-std::string decode_url(std::string_view in, std::int64_t options);
+out_buffer decode_url(std::string_view in, std::int64_t options,
+                      const scan_kernels& scan = machine_scan());
 
 }  // namespace zul::encodings

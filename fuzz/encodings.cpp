@@ -3,7 +3,9 @@
 // Invariants:
 //  1. no crash, no read outside the input (run under the sanitizers);
 //  2. every decoder accepts every byte sequence;
-//  3. fast paths equal their scalar references (URL, HTML, yEnc);
+//  3. fast paths equal their scalar references (URL, HTML, yEnc, tag
+//     removal), at every
+//     kernel level the machine has;
 //  4. decode(encode(x)) == x for URL with options 0 to 2, and for
 //     quoted-printable text without line breaks (those become CR LF / LF).
 #include <cstdint>
@@ -13,12 +15,14 @@
 #include <vector>
 
 #include "encodings/html.h"
+#include "encodings/html_tags.h"
 #include "encodings/quoted_printable.h"
 #include "encodings/sql.h"
 #include "encodings/url.h"
 #include "encodings/yenc.h"
 #include "fuzz/fuzz_check.h"
 #include "tests/reference/html_reference.h"
+#include "tests/reference/html_tags_reference.h"
 #include "tests/reference/url_reference.h"
 #include "tests/reference/yenc_reference.h"
 
@@ -32,11 +36,18 @@ extern "C" int LLVMFuzzerTestOneInput(const std::uint8_t* data, std::size_t size
   const std::int64_t options = pick >> 4;
   switch (pick % 6) {
     case 0:
-      check(enc::encode_url(in, options) == zul::reference::encode_url_reference(in, options));
-      if ((options & 3) < 3) check(enc::decode_url(enc::encode_url(in, options), options) == in);
+      for (const zul::simd::isa level : zul::simd::supported_isas()) {
+        const zul::out_buffer encoded =
+            enc::encode_url(in, options, zul::kMaxResultBytes, zul::scan_for(level));
+        check(encoded == zul::reference::encode_url_reference(in, options));
+        if ((options & 3) < 3) check(enc::decode_url(encoded, options, zul::scan_for(level)) == in);
+      }
       break;
     case 1:
-      check(enc::decode_url(in, options) == zul::reference::decode_url_reference(in, options));
+      for (const zul::simd::isa level : zul::simd::supported_isas()) {
+        check(enc::decode_url(in, options, zul::scan_for(level)) ==
+              zul::reference::decode_url_reference(in, options));
+      }
       break;
     case 2: {
       // One code point per input byte (U+0000..U+00FF, read unsigned), or
@@ -68,6 +79,11 @@ extern "C" int LLVMFuzzerTestOneInput(const std::uint8_t* data, std::size_t size
     }
     default:
       (void)enc::decode_mysql(in);
+      for (const zul::simd::isa level : zul::simd::supported_isas()) {
+        const std::string_view with = options & 1 ? "?" : "";
+        check(enc::remove_html_tags(in, with, zul::kMaxResultBytes, zul::scan_for(level)) ==
+              zul::reference::remove_html_tags_reference(in, with));
+      }
       (void)enc::replace_sql_booleans(in);
       break;
   }

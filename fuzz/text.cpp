@@ -47,8 +47,12 @@ std::string handle_bytes(const owned_handle& h) {
 void check_repair(std::span<const std::uint8_t> data, std::uint8_t knob) {
   static constexpr std::string_view kPlaceholders[] = {"", "?", "\xEF\xBF\xBD", "\xFF"};
   const std::string_view placeholder = kPlaceholders[knob % 4];
-  const std::string repaired = repair_utf8(data, placeholder);
-  check(repaired == zul::reference::repair_utf8_reference(data, placeholder));
+  const std::string repaired = zul::reference::repair_utf8_reference(data, placeholder);
+  for (const zul::simd::isa level : zul::simd::supported_isas()) {
+    check(repair_utf8(data, placeholder, zul::kMaxResultBytes,
+                      zul::simd::kernels_for(zul::simd::utf8_tables(), level))
+              .view() == repaired);
+  }
   if (knob % 4 != 3) check(well_formed_prefix(bytes_of(repaired)) == repaired.size());
   check(well_formed_prefix(data) <= data.size());
 }
@@ -75,10 +79,20 @@ std::vector<std::uint16_t> units_of(std::string_view bytes) {
 void check_single_byte(std::span<const std::uint8_t> data) {
   const std::vector<std::uint16_t> units =
       units_of({reinterpret_cast<const char*>(data.data()), data.size()});
-  check(handle_bytes(encode_single_byte(units, kISO8859_1)) ==
-        zul::reference::encode_single_byte_reference(units, escapecharsISO8859));
-  check(handle_bytes(encode_single_byte(units, kWindows1252)) ==
-        zul::reference::encode_single_byte_reference(units, escapecharsCP1252));
+  for (const zul::simd::isa level : zul::simd::supported_isas()) {
+    const single_byte_kernels& kernels = zul::simd::kernels_for(single_byte_tables(), level);
+    check(handle_bytes(encode_single_byte(units, kISO8859_1, kHandleLimit, kernels)) ==
+          zul::reference::encode_single_byte_reference(units, escapecharsISO8859));
+    check(handle_bytes(encode_single_byte(units, kWindows1252, kHandleLimit, kernels)) ==
+          zul::reference::encode_single_byte_reference(units, escapecharsCP1252));
+    const std::string decoded =
+        handle_bytes(decode_single_byte(data, kWindows1252, kHandleLimit, kernels));
+    for (std::size_t i = 0; i < data.size(); ++i) {
+      std::uint16_t unit;
+      std::memcpy(&unit, decoded.data() + 2 * i, 2);
+      check(unit == escapecharsCP1252[data[i]]);
+    }
+  }
   const owned_handle wide = decode_single_byte(data, kISO8859_1);
   const std::vector<std::uint16_t> back = units_of(handle_bytes(wide));
   check(handle_bytes(encode_single_byte(back, kISO8859_1)) ==

@@ -1,17 +1,13 @@
 // Host: loading a private copy of a plug-in, what it registered, host values
-// for tests, and the per-call ledger. The plug-in file is copied to a fresh
-// temporary file before dlopen, so each Host gets the library's globals and
-// service caches fresh, and the copy is unlinked at once.
-#include <dlfcn.h>
-#include <unistd.h>
-
+// for tests, and the per-call ledger. The platform layer loads a fresh copy
+// of the plug-in file, so each Host gets the library's globals and service
+// caches fresh.
 #include <cstdlib>
 #include <cstring>
-#include <fstream>
-#include <iterator>
 #include <stdexcept>
 
 #include "host/host_impl.h"
+#include "host/platform.h"
 
 namespace zul_host {
 
@@ -21,31 +17,6 @@ using detail::Kind;
 namespace {
 
 using PluginMain = void (*)(REALResolver);
-
-// Copies path to a new temporary file and returns the copy's name.
-std::string private_copy(const std::string& path) {
-  std::ifstream in(path, std::ios::binary);
-  if (!in) throw std::runtime_error("cannot read plug-in " + path);
-  const std::string bytes((std::istreambuf_iterator<char>(in)), std::istreambuf_iterator<char>());
-  const char* dir = std::getenv("TMPDIR");
-  std::string name = std::string(dir && *dir ? dir : "/tmp") + "/zul_plugin_XXXXXX";
-  const int fd = mkstemp(name.data());
-  if (fd < 0) throw std::runtime_error("cannot make a temporary copy of " + path);
-  const char* at = bytes.data();
-  std::size_t left = bytes.size();
-  while (left > 0) {
-    const ssize_t n = write(fd, at, left);
-    if (n <= 0) {
-      close(fd);
-      unlink(name.c_str());
-      throw std::runtime_error("cannot write the temporary copy of " + path);
-    }
-    at += n;
-    left -= static_cast<std::size_t>(n);
-  }
-  close(fd);
-  return name;
-}
 
 }  // namespace
 
@@ -61,33 +32,34 @@ Host::~Host() {
     std::free(record->methods);
     std::free(record);
   }
-  if (impl_->library) dlclose(impl_->library);
+  if (impl_->library) platform::unload_library(impl_->library);
   if (detail::live_host() == impl_) detail::set_live_host(impl_->previous_live);
   delete impl_;
 }
 
 void Host::load(const std::string& plugin_path) {
-  const std::string copy = private_copy(plugin_path);
-  void* library = dlopen(copy.c_str(), RTLD_NOW | RTLD_LOCAL);
-  unlink(copy.c_str());
-  if (!library) {
-    const char* why = dlerror();
-    throw std::runtime_error("cannot load " + plugin_path + ": " + (why ? why : "unknown error"));
-  }
-  auto entry = reinterpret_cast<PluginMain>(dlsym(library, "REALPluginMain"));
+  void* library = platform::load_library(plugin_path);
+  auto entry = reinterpret_cast<PluginMain>(platform::find_symbol(library, "REALPluginMain"));
   if (!entry) {
-    dlclose(library);
+    platform::unload_library(library);
     throw std::runtime_error(plugin_path + " has no REALPluginMain");
   }
   {
     std::lock_guard lock(impl_->mu);
-    if (impl_->library) dlclose(impl_->library);
+    if (impl_->library) platform::unload_library(impl_->library);
     impl_->library = library;
   }
   entry(&detail::resolve_service);
 }
 
 const Registration& Host::registration() const { return impl_->registration; }
+
+void Host::make_live() { detail::set_live_host(impl_); }
+
+void* Host::library_symbol(const char* name) const {
+  std::lock_guard lock(impl_->mu);
+  return impl_->library ? platform::find_symbol(impl_->library, name) : nullptr;
+}
 
 void* Host::find(std::string_view declaration) const {
   std::lock_guard lock(impl_->mu);

@@ -109,8 +109,15 @@ class Host {
   // std::runtime_error when the file cannot be loaded or has no entry.
   void load(const std::string& plugin_path);
   const Registration& registration() const;
+  // Makes this Host the live one again (a new Host becomes live when it is
+  // made): for callers that keep several Hosts, say one per host version,
+  // and call each one's plug-in only while that Host is live.
+  void make_live();
   // The native function registered under exactly this declaration, or null.
   void* find(std::string_view declaration) const;
+  // A symbol the loaded plug-in exports (dlsym), or null: for test builds
+  // of the plug-in that export controls besides REALPluginMain.
+  void* library_symbol(const char* name) const;
 
   // Typed call through the registered pointer. A converts to the native
   // argument type (Str -> REALstring, Block -> REALmemoryBlock, integers ->

@@ -1,5 +1,5 @@
-// Text conversion between the host's eight string encodings, through the C
-// library's iconv: Mac OS Roman, UTF-16 and UTF-32 in host byte order, ISO
+// Text conversion between the host's eight string encodings, through the
+// system's converter (host/platform.h): Mac OS Roman, UTF-16 and UTF-32 in host byte order, ISO
 // Latin 1, Windows Latin 1, ASCII, UTF-8, and 0xFFFF (bytes without a
 // declared encoding, read as ISO Latin 1). Byte-order marks are characters
 // like any other: nothing is added or stripped.

@@ -100,10 +100,15 @@ bool rbText::take_copy(Slot slot, const void* src, std::size_t units, std::size_
   // units comes from a length the host reports: a count whose buffer (with
   // four spare units) has no size, or that a signed length cannot hold, is
   // a failed allocation.
-  if (units > SIZE_MAX / unit - 4 || units > static_cast<std::uint64_t>(INT64_MAX)) return false;
-  // Zero-filled with room for a terminating zero unit (and then some).
-  void* buffer = std::calloc(units + 4, unit);
-  if (!buffer) return false;
+  void* buffer = nullptr;
+  if (units <= SIZE_MAX / unit - 4 && units <= static_cast<std::uint64_t>(INT64_MAX)) {
+    // Zero-filled with room for a terminating zero unit (and then some).
+    buffer = std::calloc(units + 4, unit);
+  }
+  if (!buffer) {
+    out_of_memory_ = true;
+    return false;
+  }
   if (units) std::memcpy(buffer, src, units * unit);
   owned_[slot] = buffer;
   pointers_[slot] = buffer;
@@ -120,7 +125,10 @@ void rbText::widen_ascii(Slot slot) {
   const auto count = static_cast<std::uint64_t>(n);
   if (count > SIZE_MAX - 4) return;
   auto* wide = static_cast<Unit*>(std::calloc(static_cast<std::size_t>(count) + 4, sizeof(Unit)));
-  if (!wide) return;
+  if (!wide) {
+    out_of_memory_ = true;
+    return;
+  }
   const auto* bytes = static_cast<const std::uint8_t*>(pointers_[kASCII]);
   for (std::int64_t i = 0; i < n; ++i) wide[i] = bytes[i];
   owned_[slot] = wide;
@@ -216,7 +224,10 @@ void rbText::derive_utf32_from_utf16() {
   if (n < 1) return;
   // n is at most the UTF-16 slot's unit count, which take_copy bounded.
   auto* out = static_cast<std::uint32_t*>(std::calloc(static_cast<std::size_t>(n) + 4, 4));
-  if (!out) return;
+  if (!out) {
+    out_of_memory_ = true;
+    return;
+  }
   const auto* in = static_cast<const std::uint16_t*>(pointers_[kUTF16]);
   std::int64_t count = 0;
   for (std::int64_t i = 0; i < n; ++i) {

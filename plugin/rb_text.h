@@ -47,6 +47,9 @@ class rbText {
   // True when the host could not give the text in a form asked for (the
   // form then reads as empty text).
   bool host_failed() const { return host_failed_; }
+  // True once a form could not be copied or widened for want of memory (it
+  // then reads as empty text): for callers that report failed allocations.
+  bool out_of_memory() const { return out_of_memory_; }
 
  private:
   enum Slot { kASCII = 0, kUTF8 = 1, kUTF16 = 2, kUTF32 = 3, kSlots = 4 };
@@ -73,4 +76,5 @@ class rbText {
   void* owned_[kSlots] = {nullptr, nullptr, nullptr, nullptr};
   bool is_ascii_ = false;
   bool host_failed_ = false;
+  bool out_of_memory_ = false;
 };

@@ -123,8 +123,12 @@ distance_result jaro_winkler_lists_as(code_points a, code_points b) noexcept {
   const std::size_t words = (lb + 63) / 64;
   const std::size_t bytes = words * sizeof(std::uint64_t) + (4 * lb + 1 + slots) * sizeof(Index) +
                             slots * sizeof(std::uint32_t);
-  const std::unique_ptr<std::byte[]> memory(new (std::nothrow) std::byte[bytes]);
-  if (!memory) return {0.0, static_cast<std::int64_t>(bytes)};
+  std::unique_ptr<std::byte[]> memory;
+  try {
+    memory.reset(new std::byte[bytes]);  // the plain form, as every other work buffer
+  } catch (const std::bad_alloc&) {
+    return {0.0, static_cast<std::int64_t>(bytes)};
+  }
   auto* taken = reinterpret_cast<std::uint64_t*>(memory.get());
   auto* number = reinterpret_cast<Index*>(taken + words);
   Index* position = number + lb;

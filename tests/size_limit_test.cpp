@@ -56,18 +56,19 @@ TEST(size_gate, every_gated_worker_stops_exactly_at_its_limit) {
       {"concatenation",
        sized<std::string>([&](auto limit) { return zul::binary::concat_bytes(parts, limit); })},
       {"URL, mixed",
-       sized<std::string>([](auto limit) { return enc::encode_url("a b+\xFF/z", 1, limit); })},
+       sized<zul::out_buffer>([](auto limit) { return enc::encode_url("a b+\xFF/z", 1, limit); })},
       {"URL, unreserved only (worst case past the limit, exact size within)",
-       sized<std::string>([](auto limit) { return enc::encode_url("abcdefgh", 0, limit); })},
+       sized<zul::out_buffer>([](auto limit) { return enc::encode_url("abcdefgh", 0, limit); })},
       {"quoted-printable", sized<std::string>([&](auto limit) {
          return enc::encode_quoted_printable(qp_input, 12, limit);
        })},
-      {"tag removal with a replacement", sized<std::string>([](auto limit) {
+      {"tag removal with a replacement", sized<zul::out_buffer>([](auto limit) {
          return enc::remove_html_tags("a<b>c<dd>e>f", "XY", limit);
        })},
-      {"tag removal without one",
-       sized<std::string>([](auto limit) { return enc::remove_html_tags("ab<x>cd", "", limit); })},
-      {"UTF-8 repair", sized<std::string>([](auto limit) {
+      {"tag removal without one", sized<zul::out_buffer>([](auto limit) {
+         return enc::remove_html_tags("ab<x>cd", "", limit);
+       })},
+      {"UTF-8 repair", sized<zul::out_buffer>([](auto limit) {
          return zul::text::repair_utf8(bytes_of("a\xFF"
                                                 "b\xC3\xA9\xFE"),
                                        "<?>", limit);

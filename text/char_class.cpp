@@ -10,6 +10,7 @@
 #include <cstring>
 
 #include "common/byte_set.h"
+#include "text/char_class_kernels.h"
 
 namespace zul::text {
 namespace {
@@ -94,12 +95,8 @@ bool all_bytes_in(std::span<const std::uint8_t> bytes, byte_class cls) noexcept 
 
 std::string replace_non_printable(std::span<const std::uint8_t> bytes, std::uint8_t replacement) {
   std::string out(bytes.size(), '\0');
-  // Branch-free per byte so the compiler can vectorise the loop.
-  for (std::size_t i = 0; i < bytes.size(); ++i) {
-    const std::uint8_t c = bytes[i];
-    const bool keep = static_cast<std::uint8_t>(c - 0x20) < 0x60;
-    out[i] = static_cast<char>(keep ? c : replacement);
-  }
+  detail::active_char_class_kernels().replace_non_printable(
+      bytes.data(), bytes.size(), replacement, reinterpret_cast<std::uint8_t*>(out.data()));
   return out;
 }
 

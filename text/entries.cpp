@@ -29,9 +29,9 @@ REALstring CheckUTF8(const void* data, std::int64_t size, REALstring placeholder
   rbText ph(placeholder);
   std::string_view text = ph.utf8();
   text = text.substr(0, text.find('\0'));  // the placeholder ends at its first zero byte
-  const std::string out = zul::text::repair_utf8(
+  const zul::out_buffer out = zul::text::repair_utf8(
       {static_cast<const std::uint8_t*>(data), static_cast<std::size_t>(size)}, text);
-  return build_string(out, kUTF8);
+  return build_string(out.view(), kUTF8);
 }
 
 }  // namespace

@@ -1,37 +1,39 @@
-// ISO 8859-1 / Windows-1252 conversion cores. Decoding is one table lookup
-// per byte into a handle sized once. Encoding uses a reverse map derived at
-// compile time from the same table (lowest byte first, as a search from
-// index 0 would find), plus a word-at-a-time copy of ASCII runs, which both
-// tables map to themselves. Tests compare it with a plain table search
+// ISO 8859-1 / Windows-1252 conversion cores. Both directions run the
+// machine's block kernels (latin1_x86.cpp) straight into the locked handle,
+// sized once, and finish the tail with the scalar level here: one table
+// look-up per byte when decoding; when encoding, ASCII words and then a
+// reverse map derived at compile time from the same table (lowest byte
+// first, as a search from index 0 would find, two look-ups per unit);
+// tests compare it with a plain table search
 // (tests/reference/latin1_reference.h).
 #include "text/latin1.h"
 
 #include <algorithm>
+#include <atomic>
 #include <cstring>
 #include <limits>
 #include <stdexcept>
+
+#include "text/latin1_kernels.h"
 
 namespace zul::text {
 namespace {
 
 constexpr single_byte_charset derive_charset(const charset_table& table) {
-  single_byte_charset set{&table, {}, {}, 0, true};
-  set.low.fill(-1);
+  single_byte_charset set{&table, {}, {}, true};
+  for (auto& row : set.rows) row.fill(-1);
+  set.row_of[0] = 1;
+  std::size_t rows = 2;
   for (int k = 255; k >= 0; --k) {  // downwards, so the lowest byte is left
-    if (table[k] < 0x100) set.low[table[k]] = static_cast<std::int16_t>(k);
+    const int high = table[k] >> 8;
+    if (set.row_of[high] == 0) {
+      // Not a constant expression, so a table too wide fails to compile.
+      if (rows == single_byte_charset::kRows) throw std::length_error("too many high bytes");
+      set.row_of[high] = static_cast<std::uint8_t>(rows++);
+    }
+    set.rows[set.row_of[high]][table[k] & 0xFF] = static_cast<std::int16_t>(k);
   }
-  for (int k = 0; k < 256; ++k) {
-    const std::uint32_t unit = table[k];
-    if (unit < 0x100) continue;
-    bool seen = false;
-    for (std::size_t i = 0; i < set.high_count; ++i) seen = seen || (set.high[i] >> 8) == unit;
-    if (seen) continue;
-    // Not a constant expression, so a table too wide fails to compile.
-    if (set.high_count == set.high.size()) throw std::length_error("too many wide code points");
-    set.high[set.high_count++] = (unit << 8) | static_cast<std::uint32_t>(k);
-  }
-  std::sort(set.high.begin(), set.high.begin() + static_cast<std::ptrdiff_t>(set.high_count));
-  for (int k = 0; k < 0x80; ++k) set.ascii_identity = set.ascii_identity && set.low[k] == k;
+  for (int k = 0; k < 0x80; ++k) set.ascii_identity = set.ascii_identity && set.low(k) == k;
   return set;
 }
 
@@ -66,34 +68,81 @@ owned_handle finish(owned_handle out, std::size_t count) noexcept {
   return out;
 }
 
+// The scalar level: one look-up per byte; ASCII words, then one reverse
+// look-up per unit. Both sets keep 00..7F and A0..FF as they are.
+std::size_t decode_scalar(const std::uint8_t* in, std::size_t n, std::uint16_t* out,
+                          const std::uint16_t* c1) noexcept {
+  if (c1 == nullptr) {
+    for (std::size_t i = 0; i < n; ++i) out[i] = in[i];
+  } else {
+    const std::uint16_t* table = c1 - 0x80;  // c1 is the row 80..9F of a full table
+    for (std::size_t i = 0; i < n; ++i) out[i] = table[in[i]];
+  }
+  return n;
+}
+
+std::size_t encode_scalar(const std::uint16_t* in, std::size_t n, std::uint8_t* out,
+                          const single_byte_charset& set, std::size_t* written) noexcept {
+  const std::span<const std::uint16_t> units(in, n);
+  std::size_t i = 0, o = 0;
+  while (i < n) {
+    const std::size_t next = copy_ascii_words(units, i, out + o);
+    o += next - i;
+    i = next;
+    if (i == n) break;
+    const int b = byte_for_unit(set, in[i++]);
+    out[o] = static_cast<std::uint8_t>(b);  // kept only when b is a byte
+    o += b >= 0;
+  }
+  *written = o;
+  return n;
+}
+
+constexpr single_byte_kernels kScalarKernels{decode_scalar, encode_scalar};
+
 }  // namespace
 
 constinit const single_byte_charset kISO8859_1 = derive_charset(escapecharsISO8859);
 constinit const single_byte_charset kWindows1252 = derive_charset(escapecharsCP1252);
 
-int byte_for_unit(const single_byte_charset& set, std::uint16_t unit) noexcept {
-  if (unit < 0x100) return set.low[unit];
-  const auto* first = set.high.data();
-  const auto* last = first + set.high_count;
-  const std::uint32_t key = static_cast<std::uint32_t>(unit) << 8;
-  const auto* it = std::lower_bound(first, last, key);
-  return (it != last && (*it >> 8) == unit) ? static_cast<int>(*it & 0xFF) : -1;
+// The block kernels rely on both sets keeping 00..7F and A0..FF as they are,
+// with 80..9F either kept (ISO 8859-1) or taken from the table's C1 row.
+static_assert(derive_charset(escapecharsISO8859).ascii_identity &&
+              derive_charset(escapecharsCP1252).ascii_identity);
+
+const simd::family_tables<single_byte_kernels>& single_byte_tables() noexcept {
+#if defined(__x86_64__)
+  static constexpr simd::family_tables<single_byte_kernels> tables{
+      &kScalarKernels, &detail::kSingleByteSse2, &detail::kSingleByteAvx2,
+      &detail::kSingleByteAvx512};
+#else
+  static constexpr simd::family_tables<single_byte_kernels> tables{&kScalarKernels};
+#endif
+  return tables;
+}
+
+const single_byte_kernels& single_byte_active() noexcept {
+  static std::atomic<const single_byte_kernels*> cache{nullptr};
+  return simd::active(single_byte_tables(), cache);
 }
 
 owned_handle decode_single_byte(std::span<const std::uint8_t> bytes, const single_byte_charset& set,
-                                std::size_t limit) noexcept {
+                                std::size_t limit, const single_byte_kernels& kernels) noexcept {
   if (bytes.empty() || bytes.size() > std::numeric_limits<std::size_t>::max() / 2) return {};
   owned_handle out(new_handle(2 * bytes.size(), limit));
   if (!out) return {};
   handle_lock lock(out.get());
   auto* units = reinterpret_cast<std::uint16_t*>(lock.data());
   const charset_table& table = *set.to_unicode;
-  for (std::size_t i = 0; i < bytes.size(); ++i) units[i] = table[bytes[i]];
+  const std::uint16_t* c1 = table[0x80] == 0x80 ? nullptr : &table[0x80];
+  const std::size_t done = kernels.decode(bytes.data(), bytes.size(), units, c1);
+  decode_scalar(bytes.data() + done, bytes.size() - done, units + done, c1);
   return out;
 }
 
 owned_handle encode_single_byte(std::span<const std::uint16_t> units,
-                                const single_byte_charset& set, std::size_t limit) noexcept {
+                                const single_byte_charset& set, std::size_t limit,
+                                const single_byte_kernels& kernels) noexcept {
   if (units.empty()) return {};
   // At most one byte per unit, so the handle never has to grow.
   owned_handle out(new_handle(units.size(), limit));
@@ -101,18 +150,11 @@ owned_handle encode_single_byte(std::span<const std::uint16_t> units,
   std::size_t count = 0;
   {
     handle_lock lock(out.get());
-    std::uint8_t* bytes = lock.data();
-    std::size_t i = 0;
-    while (i < units.size()) {
-      if (set.ascii_identity) {
-        const std::size_t next = copy_ascii_words(units, i, bytes + count);
-        count += next - i;
-        i = next;
-        if (i == units.size()) break;
-      }
-      const int b = byte_for_unit(set, units[i++]);
-      if (b >= 0) bytes[count++] = static_cast<std::uint8_t>(b);
-    }
+    std::size_t written = 0;
+    const std::size_t done = kernels.encode(units.data(), units.size(), lock.data(), set, &written);
+    std::size_t tail = 0;
+    encode_scalar(units.data() + done, units.size() - done, lock.data() + written, set, &tail);
+    count = written + tail;
   }
   return finish(std::move(out), count);
 }

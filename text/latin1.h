@@ -12,6 +12,7 @@
 #include <span>
 
 #include "text/handles.h"
+#include "text/latin1_kernels.h"
 
 namespace zul::text {
 
@@ -44,34 +45,41 @@ inline constexpr charset_table escapecharsISO8859 = detail::make_iso8859();
 inline constexpr charset_table escapecharsCP1252 = detail::make_cp1252();
 
 // A character set with its reverse map, derived once at compile time from
-// its table so that encoding costs one lookup per unit instead of a search.
+// its table so that encoding costs two look-ups per unit instead of a
+// search: the unit's high byte picks a row of bytes, its low byte the entry.
 struct single_byte_charset {
+  static constexpr std::size_t kRows = 8;  // no unit, units 00xx, and six more high bytes
   const charset_table* to_unicode;
-  std::array<std::int16_t, 256> low;   // byte for each unit below 0x100, -1: none
-  std::array<std::uint32_t, 32> high;  // (unit << 8) | byte for units >= 0x100, sorted
-  std::size_t high_count;
-  bool ascii_identity;  // units below 0x80 encode to themselves
+  std::array<std::uint8_t, 256> row_of;                   // high byte -> row (0: none held)
+  std::array<std::array<std::int16_t, 256>, kRows> rows;  // low byte -> byte, -1: none
+  bool ascii_identity;                                    // units below 0x80 encode to themselves
+  // The byte for a unit below 0x100, or -1.
+  constexpr int low(std::uint16_t unit) const { return rows[1][unit & 0xFF]; }
 };
 
 // The two character sets, with their reverse maps.
 extern const single_byte_charset kISO8859_1;
 extern const single_byte_charset kWindows1252;
 
-// Decodes bytes into native-order UTF-16 units, one per byte, in a handle
+// Decodes bytes into native-order UTF-16 units, one per byte (block kernels
+// of the given level, the scalar loop for the tail), in a handle
 // of exactly 2 * bytes.size() bytes. Returns a null handle for empty input
 // or when a handle of that size (at most limit bytes) cannot be had.
 owned_handle decode_single_byte(std::span<const std::uint8_t> bytes, const single_byte_charset& set,
-                                std::size_t limit = kHandleLimit) noexcept;
+                                std::size_t limit = kHandleLimit,
+                                const single_byte_kernels& kernels = single_byte_active()) noexcept;
 
 // Encodes UTF-16 units, one byte per unit that the set holds, in a handle
 // sized to the bytes written. Returns a null handle when nothing is written
 // (empty input or no unit in the set) or when the handle (at most limit
 // bytes, one per input unit) cannot be had.
 owned_handle encode_single_byte(std::span<const std::uint16_t> units,
-                                const single_byte_charset& set,
-                                std::size_t limit = kHandleLimit) noexcept;
+                                const single_byte_charset& set, std::size_t limit = kHandleLimit,
+                                const single_byte_kernels& kernels = single_byte_active()) noexcept;
 
 // The byte that encodes unit, or -1 when the set does not hold it.
-int byte_for_unit(const single_byte_charset& set, std::uint16_t unit) noexcept;
+inline int byte_for_unit(const single_byte_charset& set, std::uint16_t unit) noexcept {
+  return set.rows[set.row_of[unit >> 8]][unit & 0xFF];
+}
 
 }  // namespace zul::text

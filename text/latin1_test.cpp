@@ -40,6 +40,10 @@ std::span<const std::uint8_t> span_of(std::string_view s) {
   return {reinterpret_cast<const std::uint8_t*>(s.data()), s.size()};
 }
 
+const single_byte_kernels& kernels(zul::simd::isa level) {
+  return zul::simd::kernels_for(single_byte_tables(), level);
+}
+
 struct named_set {
   const single_byte_charset& set;
   const charset_table& table;
@@ -75,9 +79,57 @@ TEST(encode_single_byte, fast_path_matches_reference_on_random_texts) {
     const std::size_t offset = random() % 4, length = random() % 76;
     const std::span<const std::uint16_t> units(text.data() + offset, length);
     for (const auto& s : kSets) {
-      ASSERT_EQ(bytes_of(encode_single_byte(units, s.set)),
-                zul::reference::encode_single_byte_reference(units, s.table))
-          << s.name << " round " << round;
+      const std::string want = zul::reference::encode_single_byte_reference(units, s.table);
+      for (const zul::simd::isa level : zul::simd::supported_isas()) {
+        ASSERT_EQ(bytes_of(encode_single_byte(units, s.set, kHandleLimit, kernels(level))), want)
+            << s.name << " " << zul::simd::isa_name(level) << " round " << round;
+      }
+    }
+  }
+}
+// Every unit that needs the table (kept, mapped or dropped) at every
+// position of every length up to three blocks of the widest kernel, in
+// text that is otherwise plain Latin-1, on every kernel level.
+TEST(encode_single_byte, special_unit_at_every_position_on_every_kernel) {
+  const std::uint16_t specials[] = {0x80, 0x81, 0x9F, 0xA0, 0x100, 0x20AC, 0x2122, 0xD800, 0xFFFF};
+  for (std::size_t length = 1; length <= 3 * 32 + 1; ++length) {
+    std::vector<std::uint16_t> text(length);
+    for (std::size_t k = 0; k < length; ++k)
+      text[k] = static_cast<std::uint16_t>("ab\xE9 Z"[k % 5] & 0xFF);
+    for (std::size_t at = 0; at < length; ++at) {
+      for (const std::uint16_t special : specials) {
+        std::vector<std::uint16_t> in = text;
+        in[at] = special;
+        for (const auto& s : kSets) {
+          const std::string want = zul::reference::encode_single_byte_reference(in, s.table);
+          for (const zul::simd::isa level : zul::simd::supported_isas()) {
+            ASSERT_EQ(bytes_of(encode_single_byte(in, s.set, kHandleLimit, kernels(level))), want)
+                << s.name << " " << zul::simd::isa_name(level) << " length " << length << " at "
+                << at << " unit " << special;
+          }
+        }
+      }
+    }
+  }
+}
+
+// Every byte value at every lane of lengths up to three blocks.
+TEST(decode_single_byte, every_byte_at_every_position_on_every_kernel) {
+  for (std::size_t length = 1; length <= 3 * 64 + 1; length += 7) {
+    for (int value = 0; value < 256; ++value) {
+      std::string in(length, 'q');
+      for (std::size_t k = value % 3; k < length; k += 3) in[k] = static_cast<char>(value);
+      for (const auto& s : kSets) {
+        for (const zul::simd::isa level : zul::simd::supported_isas()) {
+          const std::u16string units =
+              units_of(decode_single_byte(span_of(in), s.set, kHandleLimit, kernels(level)));
+          ASSERT_EQ(units.size(), length);
+          for (std::size_t k = 0; k < length; ++k) {
+            ASSERT_EQ(units[k], s.table[static_cast<std::uint8_t>(in[k])])
+                << s.name << " " << zul::simd::isa_name(level) << " value " << value;
+          }
+        }
+      }
     }
   }
 }

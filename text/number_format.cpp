@@ -87,9 +87,8 @@ int fraction_decimals(double f, int count, char* out) {
 
 // Adds one unit in the last place of the text t[0, len), carrying leftwards
 // over the point; a carry past the first digit inserts a 1 in front of it
-// (after a minus sign), using the one spare character before t. Returns the
-// new start of the text.
-char* round_up(char* t, std::size_t& len) {
+// (after a minus sign) and moves the rest up by one (t has room for it).
+void round_up(char* t, std::size_t& len) {
   std::ptrdiff_t i = static_cast<std::ptrdiff_t>(len) - 1;
   for (; i >= 0 && t[i] != '-'; --i) {
     if (t[i] == '.') continue;
@@ -98,13 +97,12 @@ char* round_up(char* t, std::size_t& len) {
   }
   if (i >= 0 && t[i] != '-') {
     ++t[i];
-    return t;
+    return;
   }
   const auto at = static_cast<std::size_t>(i + 1);
-  std::copy_n(t, at, t - 1);
-  t[at - 1] = '1';
+  std::copy_backward(t + at, t + len, t + len + 1);
+  t[at] = '1';
   ++len;
-  return t - 1;
 }
 
 // Writes the integer part of a non-negative double, digit for digit.
@@ -151,33 +149,32 @@ number_text format_plain(double d) noexcept {
   const double whole = std::trunc(magnitude);
   const double fraction = magnitude - whole;  // exact
 
-  char* t = out.chars.data() + 1;  // one spare character for a carry
+  char* const t = out.chars.data();  // at most 410 characters, room for a carry
   char* p = t;
   if (std::signbit(d)) *p++ = '-';
   p = put_integer(p, whole);
   const auto k = static_cast<int>(std::count_if(t, p, [](char c) { return c != '0'; }));
   std::size_t len = static_cast<std::size_t>(p - t);
   if (k > 14) {  // no fraction; its first decimal is 5 or more from 0.5 on
-    if (fraction >= 0.5) t = round_up(t, len);
+    if (fraction >= 0.5) round_up(t, len);
   } else {
     *p++ = '.';
-    char decimals[99];
+    // A fraction that is not 0 means a whole part below 2^53: the 99
+    // decimals fit behind it, where they are written directly.
+    char* const decimals = p;
     const int n = fraction == 0 ? 0 : fraction_decimals(fraction, 16 - k, decimals);
     const int first = static_cast<int>(
         std::find_if(decimals, decimals + n, [](char c) { return c != '0'; }) - decimals);
     if (first == n) {  // zero at 99 decimals
-      *p++ = '0';
-      len = static_cast<std::size_t>(p - t);
+      decimals[0] = '0';
+      len = static_cast<std::size_t>(decimals + 1 - t);
     } else {
       const int cut = first + 15 - k;  // index of the deciding digit
-      const int kept = std::min(cut, n);
-      p = std::copy_n(decimals, kept, p);
-      len = static_cast<std::size_t>(p - t);
-      if (cut < n && decimals[cut] >= '5') t = round_up(t, len);
+      len = static_cast<std::size_t>(decimals + std::min(cut, n) - t);
+      if (cut < n && decimals[cut] >= '5') round_up(t, len);
       while (t[len - 1] == '0' && t[len - 2] == '0') --len;
     }
   }
-  std::copy_n(t, len, out.chars.data());
   out.size = len;
   return out;
 }

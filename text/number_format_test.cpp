@@ -84,7 +84,7 @@ const std::vector<double>& sample_doubles() {
 
 TEST(format_fixed_reference, matches_c_library) {
   for (const double d : sample_doubles()) {
-    for (const int precision : {0, 1, 17, 99}) {
+    for (const int precision : {0, 17, 99}) {
       SCOPED_TRACE(testing::Message() << std::hexfloat << d << " precision " << precision);
       ASSERT_EQ(format_fixed_reference(d, precision), c_library("%.*f", precision, d, 500));
     }
@@ -190,13 +190,14 @@ TEST(format_plain, matches_reference) {
   }
 }
 
-// A bounded run of a million everyday values (random digits at magnitudes
-// from 1e-20 to 1e20, where the reference is quick), for the rare guard
-// patterns that the sample above may miss. About a second.
-TEST(format_plain, matches_reference_on_a_million_values) {
+// A bounded run of everyday values (random digits at magnitudes from 1e-20
+// to 1e20, where the reference is quick), for the rare guard patterns that
+// the sample above may miss: a quarter of a second here, several seconds
+// under the sanitizers. The fuzz target's random run adds more.
+TEST(format_plain, matches_reference_on_random_everyday_values) {
   std::mt19937_64 random(2024);
   std::uniform_real_distribution<double> mantissa(1.0, 10.0);
-  for (int i = 0; i < 1000000; ++i) {
+  for (int i = 0; i < 250000; ++i) {
     const double d = mantissa(random) * std::pow(10.0, static_cast<int>(random() % 41) - 20);
     ASSERT_EQ(format_plain(d).view(), format_plain_reference(d)) << std::hexfloat << d;
   }

@@ -11,22 +11,26 @@
 #include <string>
 #include <string_view>
 
-#include "common/bytes.h"
-#include "common/size_gate.h"
+#include "common/out_buffer.h"
+#include "common/utf8_valid.h"
 
 namespace zul::text {
 
+using bytes_view = std::span<const std::uint8_t>;
+
 // Length of the longest prefix of bytes made of whole well-formed sequences:
 // the offset of the first byte that begins no well-formed sequence, or
-// bytes.size() when there is none. Skips ASCII a word at a time.
+// bytes.size() when there is none.
 std::size_t well_formed_prefix(bytes_view bytes) noexcept;
 
 // bytes with each byte that begins no well-formed sequence replaced by
-// placeholder (an empty placeholder drops such bytes). The output is
-// reserved once for the worst case, capped at limit; output that would pass
-// limit bytes gives "" and the repair stops there. Throws std::bad_alloc
-// when the output cannot be allocated.
-std::string repair_utf8(bytes_view bytes, std::string_view placeholder,
-                        std::uint64_t limit = kMaxResultBytes);
+// placeholder (an empty placeholder drops such bytes), using the block
+// kernels of the given level. The output is reserved once for the worst
+// case, capped at limit; output that would pass limit bytes gives "" and the
+// repair stops there. Throws std::bad_alloc when the output cannot be
+// allocated.
+out_buffer repair_utf8(bytes_view bytes, std::string_view placeholder,
+                       std::uint64_t limit = kMaxResultBytes,
+                       const simd::utf8_kernels& kernels = simd::utf8_active());
 
 }  // namespace zul::text

@@ -1,6 +1,6 @@
 # Toolchain for one cross target built with zig's clang (see zig-cxx.sh).
 # Inputs, given by the cross build (cross/CMakeLists.txt): ZUL_TARGET (one of
-# mac-x86_64, mac-arm64, win-x86_64, win-arm64, linux-arm64) and
+# mac-x86_64, mac-arm64, win-x86_64, win-arm64, linux-x86_64, linux-arm64) and
 # ZUL_ZIG_WRAPPERS (the folder holding <target>-cc, <target>-c++, -ar, -ranlib).
 set(CMAKE_TRY_COMPILE_PLATFORM_VARIABLES ZUL_TARGET ZUL_ZIG_WRAPPERS)
 

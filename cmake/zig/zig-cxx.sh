@@ -20,6 +20,7 @@ case $target in
   mac-arm64) triple=aarch64-macos.11.0 sdk_triple=aarch64-macos.11.0 arch=arm64 min_os=11.0 ;;
   win-x86_64) triple=x86_64-windows-gnu ;;
   win-arm64) triple=aarch64-windows-gnu ;;
+  linux-x86_64) triple=x86_64-linux-gnu.2.17 ;;
   linux-arm64) triple=aarch64-linux-gnu.2.17 ;;
   *) echo "zig-cxx.sh: unknown target $target" >&2; exit 2 ;;
 esac

@@ -113,8 +113,14 @@ constexpr std::size_t kRows = sizeof rows / sizeof rows[0];
 
 }  // namespace
 
+#if defined(_WIN32)
+#define FAKE_EXPORT __declspec(dllexport)
+#else
+#define FAKE_EXPORT __attribute__((visibility("default")))
+#endif
+
 // Module path on hosts from 2013 on, row by row otherwise.
-extern "C" __attribute__((visibility("default"))) void REALPluginMain(REALResolver r) {
+extern "C" FAKE_EXPORT void REALPluginMain(REALResolver r) {
   resolver = r;
   double version = 0;
   if (auto get = service<host_sig::GetRBVersion>("REALGetRBVersion")) version = get();

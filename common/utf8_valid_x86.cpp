@@ -1,0 +1,221 @@
+// x86-64 block kernels for UTF-8 well-formedness (Keiser and Lemire 2021).
+// Each byte is judged with the byte before it through three 16-entry table
+// look-ups (high nibble of the previous byte, its low nibble, high nibble of
+// this byte); each table entry is a set of error classes, and a byte pair is
+// faulty when some class is in all three. A separate test requires a
+// continuation byte two bytes after a lead of E0..FF and three bytes after
+// F0..FF; it is XORed with the "two continuations in a row" class so that
+// exactly the expected continuations pass. A block of ASCII is checked only
+// for a sequence that the previous block left open. The SSE2 level lacks
+// byte shuffles and copies ASCII blocks only.
+#include <immintrin.h>
+
+#include "common/utf8_valid.h"
+
+namespace zul::simd::detail {
+namespace {
+
+// Error classes: the bits of the table entries.
+constexpr std::uint8_t kTooShort = 1 << 0;      // lead, then no continuation
+constexpr std::uint8_t kTooLong = 1 << 1;       // ASCII, then a continuation
+constexpr std::uint8_t kOverlong3 = 1 << 2;     // E0 80..9F
+constexpr std::uint8_t kTooLarge = 1 << 3;      // F4 90..BF, F5..FF 90..BF
+constexpr std::uint8_t kSurrogate = 1 << 4;     // ED A0..BF
+constexpr std::uint8_t kOverlong2 = 1 << 5;     // C0, C1
+constexpr std::uint8_t kTooLarge1000 = 1 << 6;  // F5..FF 80..8F
+constexpr std::uint8_t kOverlong4 = 1 << 6;     // F0 80..8F
+constexpr std::uint8_t kTwoConts = 1 << 7;      // continuation, continuation
+constexpr std::uint8_t kCarry = kTooShort | kTooLong | kTwoConts;
+
+// Indexed by the high nibble of the previous byte.
+constexpr std::uint8_t kByte1High[16] = {kTooLong,
+                                         kTooLong,
+                                         kTooLong,
+                                         kTooLong,
+                                         kTooLong,
+                                         kTooLong,
+                                         kTooLong,
+                                         kTooLong,
+                                         kTwoConts,
+                                         kTwoConts,
+                                         kTwoConts,
+                                         kTwoConts,
+                                         kTooShort | kOverlong2,
+                                         kTooShort,
+                                         kTooShort | kOverlong3 | kSurrogate,
+                                         kTooShort | kTooLarge | kTooLarge1000 | kOverlong4};
+// Indexed by the low nibble of the previous byte.
+constexpr std::uint8_t kByte1Low[16] = {kCarry | kOverlong3 | kOverlong2 | kOverlong4,
+                                        kCarry | kOverlong2,
+                                        kCarry,
+                                        kCarry,
+                                        kCarry | kTooLarge,
+                                        kCarry | kTooLarge | kTooLarge1000,
+                                        kCarry | kTooLarge | kTooLarge1000,
+                                        kCarry | kTooLarge | kTooLarge1000,
+                                        kCarry | kTooLarge | kTooLarge1000,
+                                        kCarry | kTooLarge | kTooLarge1000,
+                                        kCarry | kTooLarge | kTooLarge1000,
+                                        kCarry | kTooLarge | kTooLarge1000,
+                                        kCarry | kTooLarge | kTooLarge1000,
+                                        kCarry | kTooLarge | kTooLarge1000 | kSurrogate,
+                                        kCarry | kTooLarge | kTooLarge1000,
+                                        kCarry | kTooLarge | kTooLarge1000};
+// Indexed by the high nibble of this byte.
+constexpr std::uint8_t kByte2High[16] = {
+    kTooShort,
+    kTooShort,
+    kTooShort,
+    kTooShort,
+    kTooShort,
+    kTooShort,
+    kTooShort,
+    kTooShort,
+    kTooLong | kOverlong2 | kTwoConts | kOverlong3 | kTooLarge1000 | kOverlong4,
+    kTooLong | kOverlong2 | kTwoConts | kOverlong3 | kTooLarge,
+    kTooLong | kOverlong2 | kTwoConts | kSurrogate | kTooLarge,
+    kTooLong | kOverlong2 | kTwoConts | kSurrogate | kTooLarge,
+    kTooShort,
+    kTooShort,
+    kTooShort,
+    kTooShort};
+
+// A 16-entry table repeated four times: one load fills every 128-bit lane.
+struct lane_table {
+  alignas(64) std::uint8_t bytes[64];
+};
+constexpr lane_table repeat4(const std::uint8_t (&t)[16]) {
+  lane_table r{};
+  for (int k = 0; k < 64; ++k) r.bytes[k] = t[k % 16];
+  return r;
+}
+constexpr lane_table kByte1HighX4 = repeat4(kByte1High);
+constexpr lane_table kByte1LowX4 = repeat4(kByte1Low);
+constexpr lane_table kByte2HighX4 = repeat4(kByte2High);
+
+// Subtracted with saturation from a block's last three bytes: a result
+// above zero means a sequence still open at the block's end (a lead of
+// F0..FF three bytes from the end, E0..FF two, C0..FF one).
+constexpr lane_table open_at_end(int block) {
+  lane_table r{};
+  for (int k = 0; k < 64; ++k) r.bytes[k] = 0xFF;
+  r.bytes[block - 3] = 0xEF;
+  r.bytes[block - 2] = 0xDF;
+  r.bytes[block - 1] = 0xBF;
+  return r;
+}
+constexpr lane_table kOpenAtEnd32 = open_at_end(32);
+constexpr lane_table kOpenAtEnd64 = open_at_end(64);
+
+// ---- SSE2: ASCII blocks only ----
+
+std::size_t copy_valid_sse2(const std::uint8_t* in, std::size_t n, std::uint8_t* out) noexcept {
+  std::size_t i = 0;
+  for (; i + 16 <= n; i += 16) {
+    const __m128i v = _mm_loadu_si128(reinterpret_cast<const __m128i*>(in + i));
+    if (_mm_movemask_epi8(v) != 0) break;
+    if (out != nullptr) _mm_storeu_si128(reinterpret_cast<__m128i*>(out + i), v);
+  }
+  return i;
+}
+
+// ---- AVX2: 32-byte blocks ----
+
+#define ZUL_AVX2 __attribute__((target("avx2,bmi,bmi2")))
+
+// The 32 bytes before each byte of v, N back: from prev where they precede v.
+template <int N>
+ZUL_AVX2 inline __m256i prev_avx2(__m256i v, __m256i prev) {
+  return _mm256_alignr_epi8(v, _mm256_permute2x128_si256(prev, v, 0x21), 16 - N);
+}
+
+ZUL_AVX2 inline __m256i load_avx2(const lane_table& t) {
+  return _mm256_load_si256(reinterpret_cast<const __m256i*>(t.bytes));
+}
+
+ZUL_AVX2 std::size_t copy_valid_avx2(const std::uint8_t* in, std::size_t n,
+                                     std::uint8_t* out) noexcept {
+  const __m256i byte1_high = load_avx2(kByte1HighX4);
+  const __m256i byte1_low = load_avx2(kByte1LowX4);
+  const __m256i byte2_high = load_avx2(kByte2HighX4);
+  const __m256i nibble = _mm256_set1_epi8(0x0F);
+  const __m256i open_at_end = load_avx2(kOpenAtEnd32);
+  __m256i prev = _mm256_setzero_si256();
+  __m256i prev_open = _mm256_setzero_si256();
+  std::size_t i = 0;
+  for (; i + 32 <= n; i += 32) {
+    const __m256i v = _mm256_loadu_si256(reinterpret_cast<const __m256i*>(in + i));
+    __m256i error = prev_open;
+    if (_mm256_movemask_epi8(v) != 0) {
+      const __m256i prev1 = prev_avx2<1>(v, prev);
+      const __m256i special = _mm256_and_si256(
+          _mm256_and_si256(_mm256_shuffle_epi8(
+                               byte1_high, _mm256_and_si256(_mm256_srli_epi16(prev1, 4), nibble)),
+                           _mm256_shuffle_epi8(byte1_low, _mm256_and_si256(prev1, nibble))),
+          _mm256_shuffle_epi8(byte2_high, _mm256_and_si256(_mm256_srli_epi16(v, 4), nibble)));
+      const __m256i third = _mm256_subs_epu8(prev_avx2<2>(v, prev), _mm256_set1_epi8(0x60));
+      const __m256i fourth = _mm256_subs_epu8(prev_avx2<3>(v, prev), _mm256_set1_epi8(0x70));
+      const __m256i must23 = _mm256_and_si256(_mm256_or_si256(third, fourth),
+                                              _mm256_set1_epi8(static_cast<char>(0x80)));
+      error = _mm256_xor_si256(must23, special);
+      prev_open = _mm256_subs_epu8(v, open_at_end);
+    }
+    if (!_mm256_testz_si256(error, error)) break;
+    if (out != nullptr) _mm256_storeu_si256(reinterpret_cast<__m256i*>(out + i), v);
+    prev = v;
+  }
+  return utf8_boundary_before(in, i);
+}
+
+// ---- AVX-512: 64-byte blocks ----
+
+#define ZUL_AVX512 __attribute__((target("avx512f,avx512bw,avx512vl,avx512dq,avx2,bmi,bmi2")))
+
+template <int N>
+ZUL_AVX512 inline __m512i prev_avx512(__m512i v, __m512i prev) {
+  // Lanes of the previous 16 bytes: prev's last lane, then v's lanes 0..2.
+  const __m512i lanes = _mm512_setr_epi32(28, 29, 30, 31, 0, 1, 2, 3, 4, 5, 6, 7, 8, 9, 10, 11);
+  return _mm512_alignr_epi8(v, _mm512_permutex2var_epi32(v, lanes, prev), 16 - N);
+}
+
+ZUL_AVX512 std::size_t copy_valid_avx512(const std::uint8_t* in, std::size_t n,
+                                         std::uint8_t* out) noexcept {
+  const __m512i byte1_high = _mm512_load_si512(kByte1HighX4.bytes);
+  const __m512i byte1_low = _mm512_load_si512(kByte1LowX4.bytes);
+  const __m512i byte2_high = _mm512_load_si512(kByte2HighX4.bytes);
+  const __m512i nibble = _mm512_set1_epi8(0x0F);
+  const __m512i open_at_end = _mm512_load_si512(kOpenAtEnd64.bytes);
+  __m512i prev = _mm512_setzero_si512();
+  __m512i prev_open = _mm512_setzero_si512();
+  std::size_t i = 0;
+  for (; i + 64 <= n; i += 64) {
+    const __m512i v = _mm512_loadu_si512(in + i);
+    __m512i error = prev_open;
+    if (_mm512_movepi8_mask(v) != 0) {
+      const __m512i prev1 = prev_avx512<1>(v, prev);
+      const __m512i special = _mm512_ternarylogic_epi32(
+          _mm512_shuffle_epi8(byte1_high, _mm512_and_si512(_mm512_srli_epi16(prev1, 4), nibble)),
+          _mm512_shuffle_epi8(byte1_low, _mm512_and_si512(prev1, nibble)),
+          _mm512_shuffle_epi8(byte2_high, _mm512_and_si512(_mm512_srli_epi16(v, 4), nibble)),
+          0x80);  // a & b & c
+      const __m512i third = _mm512_subs_epu8(prev_avx512<2>(v, prev), _mm512_set1_epi8(0x60));
+      const __m512i fourth = _mm512_subs_epu8(prev_avx512<3>(v, prev), _mm512_set1_epi8(0x70));
+      const __m512i must23 = _mm512_and_si512(_mm512_or_si512(third, fourth),
+                                              _mm512_set1_epi8(static_cast<char>(0x80)));
+      error = _mm512_xor_si512(must23, special);
+      prev_open = _mm512_subs_epu8(v, open_at_end);
+    }
+    if (_mm512_test_epi8_mask(error, error) != 0) break;
+    if (out != nullptr) _mm512_storeu_si512(out + i, v);
+    prev = v;
+  }
+  return utf8_boundary_before(in, i);
+}
+
+}  // namespace
+
+const utf8_kernels kUtf8Sse2{copy_valid_sse2};
+const utf8_kernels kUtf8Avx2{copy_valid_avx2};
+const utf8_kernels kUtf8Avx512{copy_valid_avx512};
+
+}  // namespace zul::simd::detail
