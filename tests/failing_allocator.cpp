@@ -1,7 +1,7 @@
 // The replaced global operator new / delete behind fail_allocations: the
-// plain, array and nothrow forms, so every one of them pairs with the same
-// free (a sanitizer runtime brings its own nothrow forms otherwise). The
-// aligned forms keep their own pairing.
+// plain, array and nothrow forms, so that every one of them pairs malloc
+// with free (the sanitizers check the pairing); the aligned forms keep
+// their own.
 #include "tests/failing_allocator.h"
 
 #include <cstdlib>
@@ -24,23 +24,19 @@ fail_allocations::~fail_allocations() { --failing; }
 
 void* operator new(std::size_t size) { return allocate(size); }
 void* operator new[](std::size_t size) { return allocate(size); }
-void* operator new(std::size_t size, const std::nothrow_t&) noexcept {
-  try {
-    return allocate(size);
-  } catch (...) {
-    return nullptr;
-  }
-}
-void* operator new[](std::size_t size, const std::nothrow_t&) noexcept {
-  try {
-    return allocate(size);
-  } catch (...) {
-    return nullptr;
-  }
-}
 void operator delete(void* p) noexcept { std::free(p); }
 void operator delete[](void* p) noexcept { std::free(p); }
 void operator delete(void* p, std::size_t) noexcept { std::free(p); }
 void operator delete[](void* p, std::size_t) noexcept { std::free(p); }
+void* operator new(std::size_t size, const std::nothrow_t&) noexcept {
+  try {
+    return allocate(size);
+  } catch (const std::bad_alloc&) {
+    return nullptr;
+  }
+}
+void* operator new[](std::size_t size, const std::nothrow_t& tag) noexcept {
+  return operator new(size, tag);
+}
 void operator delete(void* p, const std::nothrow_t&) noexcept { std::free(p); }
 void operator delete[](void* p, const std::nothrow_t&) noexcept { std::free(p); }
