@@ -8,6 +8,8 @@
 // exactly the expected continuations pass. A block of ASCII is checked only
 // for a sequence that the previous block left open. The SSE2 level lacks
 // byte shuffles and copies ASCII blocks only.
+// Compiled on x86-64 only; other targets get an empty unit.
+#if defined(__x86_64__) || defined(_M_X64)
 #include <immintrin.h>
 
 #include "common/utf8_valid.h"
@@ -219,3 +221,5 @@ const utf8_kernels kUtf8Avx2{copy_valid_avx2};
 const utf8_kernels kUtf8Avx512{copy_valid_avx512};
 
 }  // namespace zul::simd::detail
+
+#endif  // x86-64

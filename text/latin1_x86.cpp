@@ -6,6 +6,8 @@
 // plain 00..FF value of the set; that unit takes the table look-up and the
 // next block starts right after it (the output never passes the input, so
 // the whole-block store always has room).
+// Compiled on x86-64 only; other targets get an empty unit.
+#if defined(__x86_64__) || defined(_M_X64)
 #include <immintrin.h>
 
 #include "text/latin1.h"
@@ -229,3 +231,5 @@ const single_byte_kernels kSingleByteAvx2{decode_avx2, encode_avx2};
 const single_byte_kernels kSingleByteAvx512{decode_avx512, encode_avx512};
 
 }  // namespace zul::text::detail
+
+#endif  // x86-64
