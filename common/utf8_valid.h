@@ -2,8 +2,8 @@
 // Unicode Standard (Table 3-7: no overlong forms, no surrogates D800..DFFF,
 // nothing above 10FFFF; the zero byte is an ordinary one-byte sequence), as a
 // scalar scan and as vector kernels that prove whole blocks well formed with
-// the lookup-table method of Keiser and Lemire, "Validating UTF-8 in less
-// than one instruction per byte" (2021), copying each block as they go.
+// the published lookup-table method ("Validating UTF-8 in less than one
+// instruction per byte", 2021), copying each block as they go.
 #pragma once
 
 #include <cstddef>

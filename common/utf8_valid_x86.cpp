@@ -1,4 +1,4 @@
-// x86-64 block kernels for UTF-8 well-formedness (Keiser and Lemire 2021).
+// x86-64 block kernels for UTF-8 well-formedness (lookup-table method).
 // Each byte is judged with the byte before it through three 16-entry table
 // look-ups (high nibble of the previous byte, its low nibble, high nibble of
 // this byte); each table entry is a set of error classes, and a byte pair is

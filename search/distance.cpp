@@ -1,9 +1,10 @@
-// The restricted edit distance as bit vectors (Hyyrö 2003, "A bit-vector
-// algorithm for computing Levenshtein and Damerau edit distances", built on
-// Myers 1999): each column of the matrix is held as bit vectors of its
-// vertical, horizontal and diagonal differences, 64 rows per machine word,
-// with one extra vector for adjacent swaps. A pattern of up to 64 characters
-// fits one word and needs no memory at all; longer ones go block by block.
+// The restricted edit distance as bit vectors (the published bit-vector
+// algorithm for Levenshtein and Damerau edit distances, 2003, built on the
+// bit-parallel approximate matching of 1999): each column of the matrix is
+// held as bit vectors of its vertical, horizontal and diagonal differences,
+// 64 rows per machine word, with one extra vector for adjacent swaps. A
+// pattern of up to 64 characters fits one word and needs no memory at all;
+// longer ones go block by block.
 #include "search/distance.h"
 
 #include <algorithm>

@@ -1,6 +1,6 @@
 // Number formatting on std::to_chars with a precision, whose digits are the
-// exact decimal value of the double rounded half to even (libstdc++ and
-// libc++ both implement it with Ryu printf). The plain text needs only the
+// exact decimal value of the double rounded half to even (as both libstdc++
+// and libc++ implement it). The plain text needs only the
 // digits up to its cut, not all 99 decimals: see fraction_decimals.
 #include "text/number_format.h"
 
