@@ -2,7 +2,7 @@
 // AVX-512 VBMI2 compress). The scalar path, fallback and tail: runs between
 // "=" escapes are a plain subtraction of 42, which the compiler vectorises;
 // escapes are handled one at a time. One output buffer of the input's size,
-// trimmed at the end.
+// reserved and never zero-filled; the result is the part written.
 #include "encodings/yenc.h"
 
 #include <atomic>
@@ -56,12 +56,11 @@ const simd::family_tables<yenc_kernels>& yenc_tables() noexcept {
 
 }  // namespace detail
 
-std::string decode_yenc(std::string_view in) {
-  std::string out(in.size(), '\0');
-  const std::size_t written = simd::active(detail::yenc_tables(), detail::active_kernels)
-                                  .decode(reinterpret_cast<const std::uint8_t*>(in.data()),
-                                          in.size(), reinterpret_cast<std::uint8_t*>(out.data()));
-  out.resize(written);
+out_buffer decode_yenc(std::string_view in) {
+  out_buffer out(in.size());
+  std::uint8_t* o = out.tail();
+  out.commit(simd::active(detail::yenc_tables(), detail::active_kernels)
+                 .decode(reinterpret_cast<const std::uint8_t*>(in.data()), in.size(), o));
   return out;
 }
 
