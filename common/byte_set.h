@@ -4,7 +4,8 @@
 // is both the 256-bit membership and what the vector kernels shuffle: any set
 // size costs the same constant work per block. The set also keeps up to
 // kMaxRanges byte ranges whose union it is, for the SSE2 level, which has
-// no byte shuffle and tests each range with a compare instead. Stable
+// no byte shuffle and tests each range with a compare instead (from SSSE3
+// on, the kernels shuffle). Stable
 // interface: the search families and the encoders' "next byte that needs
 // work" scans call it.
 #pragma once
@@ -106,6 +107,8 @@ std::size_t find_first_in_set_scalar(const byte_set& set, const std::uint8_t* p,
                                      std::size_t n) noexcept;
 std::size_t find_first_in_set_sse2(const byte_set& set, const std::uint8_t* p,
                                    std::size_t n) noexcept;
+std::size_t find_first_in_set_ssse3(const byte_set& set, const std::uint8_t* p,
+                                    std::size_t n) noexcept;
 std::size_t find_first_in_set_avx2(const byte_set& set, const std::uint8_t* p,
                                    std::size_t n) noexcept;
 std::size_t find_first_in_set_avx512(const byte_set& set, const std::uint8_t* p,
