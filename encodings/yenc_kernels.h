@@ -18,6 +18,7 @@ struct yenc_kernels {
 const simd::family_tables<yenc_kernels>& yenc_tables() noexcept;
 
 std::size_t decode_yenc_scalar(const std::uint8_t* in, std::size_t n, std::uint8_t* out) noexcept;
+std::size_t decode_yenc_ssse3(const std::uint8_t* in, std::size_t n, std::uint8_t* out) noexcept;
 std::size_t decode_yenc_avx2(const std::uint8_t* in, std::size_t n, std::uint8_t* out) noexcept;
 std::size_t decode_yenc_avx512_vbmi2(const std::uint8_t* in, std::size_t n,
                                      std::uint8_t* out) noexcept;
