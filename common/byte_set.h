@@ -27,15 +27,14 @@ class byte_set {
   constexpr void add(std::uint8_t b) noexcept {
     if (contains(b)) return;
     set_bit(b);
-    // Extend a range that b touches, else start one (ranges may end up
-    // overlapping; only their union matters).
+    // Extend a range that b touches, joining it with a range it then
+    // touches, else start one (ranges from add_range may overlap; only
+    // their union matters).
     for (std::size_t r = 0; r < range_count_ && r < kMaxRanges; ++r) {
-      if (b + 1 == first_[r]) {
-        first_[r] = b;
-        return;
-      }
-      if (b == last_[r] + 1) {
-        last_[r] = b;
+      if (b + 1 == first_[r] || b == last_[r] + 1) {
+        if (b < first_[r]) first_[r] = b;
+        if (b > last_[r]) last_[r] = b;
+        join(r);
         return;
       }
     }
@@ -66,6 +65,20 @@ class byte_set {
  private:
   constexpr void set_bit(std::uint8_t b) noexcept {
     rows_[b >> 7][b & 15] |= static_cast<std::uint8_t>(1u << ((b >> 4) & 7));
+  }
+  // Merges into range r the first other range that touches or overlaps it
+  // (one byte just added can bridge at most that one gap).
+  constexpr void join(std::size_t r) noexcept {
+    if (range_count_ > kMaxRanges) return;
+    for (std::size_t s = 0; s < range_count_; ++s) {
+      if (s == r || first_[s] > last_[r] + 1 || first_[r] > last_[s] + 1) continue;
+      if (first_[s] < first_[r]) first_[r] = first_[s];
+      if (last_[s] > last_[r]) last_[r] = last_[s];
+      --range_count_;
+      first_[s] = first_[range_count_];
+      last_[s] = last_[range_count_];
+      return;
+    }
   }
   constexpr void push_range(std::uint8_t first, std::uint8_t last) noexcept {
     if (range_count_ < kMaxRanges) {
