@@ -44,13 +44,6 @@ TEST(cache_kinds, once_only_length_method_missing_reads_strings_as_empty) {
   EXPECT_EQ(host.last_ledger_report(), "");
 }
 
-TEST(cache_kinds, length_method_is_found_by_its_exact_declaration) {
-  Host host;
-  loaded(host);
-  EXPECT_EQ(host.call<std::int64_t>(kBytes, utf8("hello world"), utf8("ow")), 5);
-  EXPECT_EQ(host.service_calls("REALLoadGlobalMethod"), 1);
-}
-
 TEST(cache_kinds, retry_size_property_is_asked_again_until_found) {
   Host host(null_at_first({"REALGetPropValueInteger"}));
   loaded(host);

@@ -4,6 +4,7 @@
 // which functions read bytes and which read characters.
 #include <string>
 
+#include "tests/declarations.h"
 #include "tests/host_fixture.h"
 
 namespace {
@@ -14,11 +15,8 @@ using zul_host::tagged;
 using zul_host::utf8;
 using namespace text_encoding;
 
-constexpr const char* kCount = "CountOccurancesZUL(s as string, find as string) as integer";
-constexpr const char* kCompBytes = "StrCompBytesZUL(a as string, b as string) as integer";
-constexpr const char* kCompChars = "StrCompCharactersZUL(a as string, b as string) as integer";
-constexpr const char* kJaro = "JaroWinklerDistanceZUL(a as string, b as string) as double";
-constexpr const char* kEdit = "LevenshteinDistanceZUL(a as string, b as string) as double";
+const auto kCount = decl(18), kCompBytes = decl(16), kCompChars = decl(17), kJaro = decl(10),
+           kEdit = decl(11);
 
 using Search = HostTest;
 

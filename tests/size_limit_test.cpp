@@ -111,8 +111,6 @@ class SizeLimit : public HostTest {
   SizeLimit() : HostTest(claiming_host()) {}
 };
 
-const char* decl(int row) { return kDeclarations[row - 1]; }
-
 TEST_F(SizeLimit, results_past_the_limit_are_null_and_raise_nothing) {
   const Str big = utf8("3GiB"), part = utf8("600MiB"), hex_big = utf8("1GiB"), small = utf8("k");
   const std::int64_t k0 = 0, k1 = 1, k2 = 2, k16 = 16;

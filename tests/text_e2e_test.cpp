@@ -4,6 +4,7 @@
 #include <string>
 #include <string_view>
 
+#include "tests/declarations.h"
 #include "tests/host_fixture.h"
 
 namespace {
@@ -15,14 +16,8 @@ using zul_host::tagged;
 using zul_host::utf8;
 using namespace text_encoding;
 
-constexpr const char* kCheckP =
-    "CheckUTF8ZUL(data as ptr, size as Integer, Placeholder as string) as string";
-constexpr const char* kCheckM = "CheckUTF8ZUL(mem as MemoryBlock, Placeholder as string) as string";
-constexpr const char* kCheckS = "CheckUTF8ZUL(data as string, Placeholder as string) as string";
-constexpr const char* kReplace =
-    "ReplaceNonPrintableCharactersZUL(s as string, replacevalue as integer=46) as string";
-constexpr const char* kIsASCII1 = "IsASCIIStringZUL(s as string) as boolean";
-constexpr const char* kIsASCII2 = "IsASCIIStringZUL(s as string, mode as integer) as boolean";
+const auto kCheckP = decl(4), kCheckM = decl(5), kCheckS = decl(6), kReplace = decl(47),
+           kIsASCII1 = decl(48), kIsASCII2 = decl(49);
 
 using Text = HostTest;
 

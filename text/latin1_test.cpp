@@ -134,17 +134,6 @@ TEST(decode_single_byte, every_byte_at_every_position_on_every_kernel) {
   }
 }
 
-TEST(decode_single_byte, every_byte_gives_its_table_entry) {
-  std::string all;
-  for (int b = 0; b < 256; ++b) all += static_cast<char>(b);
-  for (const auto& s : kSets) {
-    SCOPED_TRACE(s.name);
-    const std::u16string units = units_of(decode_single_byte(span_of(all), s.set));
-    ASSERT_EQ(units.size(), 256u);
-    for (int b = 0; b < 256; ++b) EXPECT_EQ(units[b], s.table[b]) << b;
-  }
-}
-
 TEST(single_byte, handle_beyond_the_limit_gives_null) {
   EXPECT_FALSE(decode_single_byte(span_of("abc"), kISO8859_1, 5));
   EXPECT_EQ(bytes_of(decode_single_byte(span_of("abc"), kISO8859_1, 6)).size(), 6u);
