@@ -1,7 +1,7 @@
 // Single-byte character sets: the reverse map against a plain table search
 // for every UTF-16 unit, the fast encoder against the unit-by-unit one on
 // random texts at every offset, and every byte through the decoder. The
-// conversions' examples run end to end in tests/text_convert_e2e_test.cpp.
+// conversions' examples run end to end in tests/text_e2e_test.cpp.
 #include "text/latin1.h"
 
 #include <gtest/gtest.h>
