@@ -95,8 +95,7 @@ TEST_F(Binary, concat_create_random) {
 }
 
 TEST_F(Binary, hex) {
-  std::string all;
-  for (int b = 0; b < 256; ++b) all += static_cast<char>(b);
+  const std::string all = all_bytes();
   check({
       {call<Str>(kToHex, raw("\x00\x7F\x80\xFF"sv)), ascii("007F80FF"), "upper case"},
       {call<Str>(kToHex, tagged("\xE9", kLatin1)), ascii("E9"), "stored bytes, not characters"},
@@ -189,15 +188,12 @@ TEST_F(Binary, readable_runs_without_data) {
 
 // A host that cannot hand out a memory block's bytes: the block reads as no
 // data, and is still unlocked afterwards (the ledger checks it).
-class BinaryWithoutBlockBytes : public HostTest {
- protected:
-  BinaryWithoutBlockBytes() : HostTest(config()) {}
-  static zul_host::HostConfig config() {
-    zul_host::HostConfig c;
-    c.missing = {"REALLoadObjectMethod", "memoryBlockGetPtr"};
-    return c;
-  }
-};
+zul_host::HostConfig without_block_bytes() {
+  zul_host::HostConfig config;
+  config.missing = {"REALLoadObjectMethod", "memoryBlockGetPtr"};
+  return config;
+}
+using BinaryWithoutBlockBytes = HostTestWith<without_block_bytes>;
 
 TEST_F(BinaryWithoutBlockBytes, block_reads_as_no_data) {
   EXPECT_TRUE(call<StrArray>(kRunsM, Block{"Hello", false}, k0).null);

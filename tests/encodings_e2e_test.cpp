@@ -107,10 +107,7 @@ TEST_F(Encodings, string_functions) {
 }
 
 TEST_F(Encodings, round_trips_of_every_byte_past_the_reserves) {
-  std::string all;
-  for (int round = 0; round < 300; ++round) {
-    for (int b = 0; b < 256; ++b) all += static_cast<char>(b);
-  }
+  const std::string all = all_bytes(300);
   for (const std::int64_t options : {0, 1, 2}) {
     SCOPED_TRACE(options);
     EXPECT_TRUE(same(call<Str>(kUnURL2, call<Str>(kURL2, tagged(all, kUnknown), options), options),
@@ -197,8 +194,7 @@ TEST_F(Encodings, subject_without_a_utf8_form_is_null) {
 }
 
 TEST_F(Encodings, yenc_memory_block_matches_the_string_variant) {
-  std::string all;
-  for (int b = 0; b < 256; ++b) all += static_cast<char>(b);
+  const std::string all = all_bytes();
   const Block from_block = call<Block>(kYencM, Block{all});
   EXPECT_FALSE(from_block.null);
   EXPECT_EQ(from_block.bytes, call<Str>(kYencS, tagged(all, kUnknown)).bytes);
@@ -206,15 +202,12 @@ TEST_F(Encodings, yenc_memory_block_matches_the_string_variant) {
   EXPECT_TRUE(call<Block>(kYencM, Block{""}).null);
 }
 
-class SmallBlocks : public HostTest {
- protected:
-  SmallBlocks()
-      : HostTest([] {
-          zul_host::HostConfig config;
-          config.block_cap = 4;
-          return config;
-        }()) {}
-};
+zul_host::HostConfig small_blocks() {
+  zul_host::HostConfig config;
+  config.block_cap = 4;
+  return config;
+}
+using SmallBlocks = HostTestWith<small_blocks>;
 
 TEST_F(SmallBlocks, yenc_memory_block_that_cannot_be_made) {
   EXPECT_TRUE(call<Block>(kYencM, Block{"rstuvwxyz"}).null);

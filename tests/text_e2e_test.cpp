@@ -65,17 +65,14 @@ TEST_F(Text, check_utf8_overloads_agree) {
 TEST_F(Text, check_utf8_without_bytes_skips_the_placeholder) {
   const Str placeholder = utf16(u"\uFFFD");  // reading it would need a host conversion
   const int before = host_.service_calls("PluginGetStringData");
-  const char* text = "abc";
+  const void *text = "abc", *nothing = nullptr;
   EXPECT_TRUE(call<Str>(kCheckS, null_string(), placeholder).null);
   EXPECT_TRUE(call<Str>(kCheckS, utf8(""), placeholder).null);
   EXPECT_TRUE(call<Str>(kCheckM, Block{"", true}, placeholder).null);
   EXPECT_TRUE(call<Str>(kCheckM, Block{"", false}, placeholder).null);
-  EXPECT_TRUE(
-      call<Str>(kCheckP, static_cast<const void*>(nullptr), std::int64_t{3}, placeholder).null);
-  EXPECT_TRUE(
-      call<Str>(kCheckP, static_cast<const void*>(text), std::int64_t{0}, placeholder).null);
-  EXPECT_TRUE(
-      call<Str>(kCheckP, static_cast<const void*>(text), std::int64_t{-1}, placeholder).null);
+  for (const auto& [data, size] : {std::pair{nothing, 3}, {text, 0}, {text, -1}}) {
+    EXPECT_TRUE(call<Str>(kCheckP, data, std::int64_t{size}, placeholder).null) << size;
+  }
   EXPECT_EQ(host_.service_calls("PluginGetStringData"), before);
 }
 
@@ -167,10 +164,7 @@ TEST_F(Text, conversions) {
 }
 
 TEST_F(Text, every_byte_round_trips) {
-  std::string all;
-  for (int round = 0; round < 20; ++round) {  // past any first buffer size
-    for (int b = 0; b < 256; ++b) all += static_cast<char>(b);
-  }
+  const std::string all = all_bytes(20);  // past any first buffer size
   EXPECT_TRUE(same(call<Str>(kToISO, call<Str>(kFromISO, unknown(all))), unknown(all)));
   std::string cp = all;
   for (char& c : cp) {
