@@ -22,6 +22,8 @@
 namespace zul::text {
 namespace {
 
+using namespace std::string_view_literals;
+
 const simd::utf8_kernels& kernels(simd::isa level) {
   return simd::kernels_for(simd::utf8_tables(), level);
 }
@@ -99,7 +101,7 @@ TEST(repair_utf8, prefix_skip_matches_reference_on_random_data) {
                                      "\xF4\x90",
                                      "\xE2\x82",
                                      "\xFF",
-                                     std::string_view("\0", 1)};
+                                     "\0"sv};
   for (int round = 0; round < 5000; ++round) {
     std::string in;
     const std::size_t parts = rng() % 24;
