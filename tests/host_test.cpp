@@ -117,23 +117,6 @@ TEST_F(FakeHost, call_rejects_mismatched_types) {
                std::invalid_argument);
 }
 
-TEST(host_registration, both_paths_and_ownership) {
-  for (std::optional<double> version : {std::optional<double>{}, std::optional<double>{2019.0}}) {
-    HostConfig config;
-    config.version = version;
-    Host host(config);
-    host.load(ZUL_FAKE_PLUGIN_PATH);
-    const Registration& r = host.registration();
-    ASSERT_EQ(r.methods.size(), 8u);
-    EXPECT_EQ(r.methods[0].declaration, "FakeEchoZUL(s as string) as string");
-    EXPECT_EQ(r.module_calls, version ? 1 : 0);
-    EXPECT_EQ(r.method_calls, version ? 0 : 8);
-    EXPECT_EQ(r.module_name, version ? "FakeModule" : "");
-    EXPECT_EQ(*r.announced_version, version ? 13 : 9);
-    EXPECT_EQ(host.find("FakeEchoZUL(s as string) as string"), r.methods[0].function);
-  }
-}
-
 TEST(host_resolver, missing_and_late_services) {
   HostConfig config;
   config.missing = {"REALLockString"};
