@@ -174,6 +174,8 @@ TEST_F(Text, every_byte_round_trips) {
   EXPECT_TRUE(same(call<Str>(kToCP, call<Str>(kFromCP, unknown(all))), unknown(cp)));
 }
 
+// Each mark form is the worker's to tell (text/markers_test.cpp); here the
+// function must see the stored bytes whole, zero bytes included.
 TEST_F(Text, detect_markers) {
   const struct {
     Str in;
@@ -181,16 +183,9 @@ TEST_F(Text, detect_markers) {
     const char* why;
   } rows[] = {
       {unknown("\xEF\xBB\xBFz"), 1, "UTF-8"},
-      {unknown("\xEF\xBB"), 0, "UTF-8 cut short"},
-      {unknown("\xFF\xFE"), 4, "UTF-16 LE"},
-      {unknown("\xFF\xFE\x00"sv), 4, "UTF-16 LE, three bytes"},
       {unknown("\xFF\xFE\x00\x00"sv), 7, "UTF-32 LE"},
-      {unknown("\xFF\xFE\x00\x01"sv), 4, "UTF-16 LE then text"},
-      {unknown("\xFE\xFF\x00\x41"sv), 3, "UTF-16 BE"},
       {unknown("\x00\x00\xFE\xFF"sv), 6, "UTF-32 BE"},
-      {unknown("\x00\x00\x00\x41"sv), 0, "no mark"},
       {tagged("\xFF\xFE", kLatin1), 4, "stored bytes, whatever the tag"},
-      {unknown("\xFF"), 0, "single byte"},
       {utf8(""), 0, "empty"},
       {null_string(), 0, "null"},
   };
