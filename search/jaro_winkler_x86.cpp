@@ -1,0 +1,168 @@
+// Jaro-Winkler matching for a b of at most 64 characters with AVX-512 (F,
+// BW). b sits in registers, in the narrowest lanes that hold every
+// character of b and of the reach of a (bytes, 16 or 32 bits), so the mask
+// of b's positions that hold a character is one compare of b with that
+// character broadcast: no table to build or clear, whatever the code
+// points. What stays serial is the taken mask: per character of a, AND-NOT,
+// lowest set bit, OR. Matched pairs are counted by compressing the taken
+// characters of b to the front and comparing them with the matched
+// characters of a, 16 at a time.
+#include "search/jaro_kernels.h"
+
+// The zero-masked forms of the conversions and inserts are used throughout:
+// GCC 12's plain forms start from an undefined register and warn about it.
+#if defined(__x86_64__) || defined(_M_X64)
+#include <immintrin.h>
+
+#include <algorithm>
+
+#define ZUL_AVX512 \
+  __attribute__((target("avx2,bmi,bmi2,popcnt,avx512f,avx512bw,avx512vl,avx512dq")))
+
+namespace zul::search::detail {
+namespace {
+
+ZUL_AVX512 inline __mmask16 first_lanes(std::size_t n) {
+  return n >= 16 ? static_cast<__mmask16>(0xFFFF) : static_cast<__mmask16>((1u << n) - 1);
+}
+
+// The OR of the code units of p[0..n): its highest bit bounds them all.
+ZUL_AVX512 __m512i or_of(const std::uint32_t* p, std::size_t n) {
+  __m512i m = _mm512_setzero_si512();
+  std::size_t i = 0;
+  for (; i + 16 <= n; i += 16) m = _mm512_or_si512(m, _mm512_loadu_si512(p + i));
+  return _mm512_or_si512(m, _mm512_maskz_loadu_epi32(first_lanes(n - i), p + i));
+}
+
+// Whether every lane of v is below 2^bits.
+ZUL_AVX512 bool fits(__m512i v, int bits) {
+  return _mm512_test_epi32_mask(v, _mm512_set1_epi32(-(1 << bits))) == 0;
+}
+
+// b in 32-bit lanes, 16 per register; lanes at and beyond lb are zero.
+struct b_lanes {
+  __m512i v[4];
+  __mmask16 valid[4];
+};
+
+// Position masks with b in byte lanes: one register, one compare.
+struct lanes8 {
+  __m512i b;
+  __mmask64 valid;
+  ZUL_AVX512 explicit lanes8(const b_lanes& w) {
+    const __m512i lo = _mm512_maskz_inserti32x4(
+        0xFFFF,
+        _mm512_maskz_inserti32x4(0xFFFF, _mm512_setzero_si512(),
+                                 _mm512_maskz_cvtepi32_epi8(0xFFFF, w.v[0]), 0),
+        _mm512_maskz_cvtepi32_epi8(0xFFFF, w.v[1]), 1);
+    const __m512i hi =
+        _mm512_maskz_inserti32x4(0xFFFF, lo, _mm512_maskz_cvtepi32_epi8(0xFFFF, w.v[2]), 2);
+    b = _mm512_maskz_inserti32x4(0xFFFF, hi, _mm512_maskz_cvtepi32_epi8(0xFFFF, w.v[3]), 3);
+    std::uint64_t bits = 0;
+    for (int k = 3; k >= 0; --k) bits = (bits << 16) | w.valid[k];
+    valid = bits;
+  }
+  ZUL_AVX512 std::uint64_t operator()(std::uint32_t c) const {
+    return _mm512_mask_cmpeq_epi8_mask(valid, b, _mm512_set1_epi8(static_cast<char>(c)));
+  }
+};
+
+// 16-bit lanes: two registers of 32.
+struct lanes16 {
+  __m512i b[2];
+  __mmask32 valid[2];
+  ZUL_AVX512 explicit lanes16(const b_lanes& w) {
+    for (int h = 0; h < 2; ++h) {
+      b[h] = _mm512_maskz_inserti64x4(
+          0xFF,
+          _mm512_maskz_inserti64x4(0xFF, _mm512_setzero_si512(),
+                                   _mm512_maskz_cvtepi32_epi16(0xFFFF, w.v[2 * h]), 0),
+          _mm512_maskz_cvtepi32_epi16(0xFFFF, w.v[2 * h + 1]), 1);
+      valid[h] = static_cast<__mmask32>(w.valid[2 * h] | (std::uint32_t{w.valid[2 * h + 1]} << 16));
+    }
+  }
+  ZUL_AVX512 std::uint64_t operator()(std::uint32_t c) const {
+    const __m512i x = _mm512_set1_epi16(static_cast<short>(c));
+    return std::uint64_t{_mm512_mask_cmpeq_epi16_mask(valid[0], b[0], x)} |
+           std::uint64_t{_mm512_mask_cmpeq_epi16_mask(valid[1], b[1], x)} << 32;
+  }
+};
+
+// Whole code points: four registers of 16.
+struct lanes32 {
+  const b_lanes& w;
+  ZUL_AVX512 explicit lanes32(const b_lanes& lanes) : w(lanes) {}
+  ZUL_AVX512 std::uint64_t operator()(std::uint32_t c) const {
+    const __m512i x = _mm512_set1_epi32(static_cast<int>(c));
+    std::uint64_t m = 0;
+    for (int k = 0; k < 4; ++k) {
+      m |= std::uint64_t{_mm512_mask_cmpeq_epi32_mask(w.valid[k], w.v[k], x)} << (16 * k);
+    }
+    return m;
+  }
+};
+
+template <class Positions>
+ZUL_AVX512 jaro_counts match_with(const Positions& positions, const b_lanes& w,
+                                  std::span<const std::uint32_t> reach, std::size_t window) {
+  // bits max(0, i - window) to i + window of b: the window of position i.
+  std::uint64_t bound = window >= 63 ? ~std::uint64_t{0} : (std::uint64_t{2} << window) - 1;
+  std::uint64_t taken = 0;
+  // The k-th matched character of a goes to index k; a character without a
+  // match is written there and overwritten by the next one.
+  alignas(64) std::uint32_t matched_a[80];
+  // Masks of 16 characters are found first, apart from the serial chain,
+  // so that their compares overlap instead of queueing behind it.
+  std::uint64_t open_in[16];
+  for (std::size_t start = 0; start < reach.size(); start += 16) {
+    const std::size_t n = std::min<std::size_t>(16, reach.size() - start);
+    for (std::size_t k = 0; k < n; ++k) {
+      const std::size_t i = start + k;
+      open_in[k] = positions(reach[i]) & bound;
+      bound = (bound << 1) | (i < window ? 1 : 0);
+    }
+    for (std::size_t k = 0; k < n; ++k) {
+      matched_a[_mm_popcnt_u64(taken)] = reach[start + k];
+      taken |= _blsi_u64(open_in[k] & ~taken);
+    }
+  }
+  alignas(64) std::uint32_t matched_b[64];
+  std::size_t filled = 0;
+  for (int k = 0; k < 4; ++k) {
+    const auto part = static_cast<__mmask16>(taken >> (16 * k));
+    _mm512_storeu_si512(matched_b + filled, _mm512_maskz_compress_epi32(part, w.v[k]));
+    filled += static_cast<std::size_t>(_mm_popcnt_u32(part));
+  }
+  jaro_counts counts;
+  counts.matches = filled;
+  for (std::size_t k = 0; k < filled; k += 16) {
+    const __mmask16 live = first_lanes(filled - k);
+    const __mmask16 differ =
+        _mm512_mask_cmpneq_epi32_mask(live, _mm512_maskz_loadu_epi32(live, matched_a + k),
+                                      _mm512_maskz_loadu_epi32(live, matched_b + k));
+    counts.crossed += static_cast<std::size_t>(_mm_popcnt_u32(differ));
+  }
+  return counts;
+}
+
+}  // namespace
+
+ZUL_AVX512 jaro_counts match_word_avx512(std::span<const std::uint32_t> reach,
+                                         std::span<const std::uint32_t> b,
+                                         std::size_t window) noexcept {
+  b_lanes w;
+  for (std::size_t k = 0; k < 4; ++k) {
+    const std::size_t from = std::min(16 * k, b.size());
+    w.valid[k] = first_lanes(b.size() - from);
+    w.v[k] = _mm512_maskz_loadu_epi32(w.valid[k], b.data() + from);
+  }
+  const __m512i used =
+      _mm512_or_si512(or_of(b.data(), b.size()), or_of(reach.data(), reach.size()));
+  if (fits(used, 8)) return match_with(lanes8(w), w, reach, window);
+  if (fits(used, 16)) return match_with(lanes16(w), w, reach, window);
+  return match_with(lanes32(w), w, reach, window);
+}
+
+}  // namespace zul::search::detail
+
+#endif
