@@ -42,13 +42,12 @@ ZUL_AVX512 bool fits(__m512i v, int bits) {
 // b in 32-bit lanes, 16 per register; lanes at and beyond lb are zero.
 struct b_lanes {
   __m512i v[4];
-  __mmask16 valid[4];
+  std::uint64_t valid;  // bits 0 to lb - 1
 };
 
 // Position masks with b in byte lanes: one register, one compare.
 struct lanes8 {
   __m512i b;
-  __mmask64 valid;
   ZUL_AVX512 explicit lanes8(const b_lanes& w) {
     const __m512i lo = _mm512_maskz_inserti32x4(
         0xFFFF,
@@ -58,19 +57,15 @@ struct lanes8 {
     const __m512i hi =
         _mm512_maskz_inserti32x4(0xFFFF, lo, _mm512_maskz_cvtepi32_epi8(0xFFFF, w.v[2]), 2);
     b = _mm512_maskz_inserti32x4(0xFFFF, hi, _mm512_maskz_cvtepi32_epi8(0xFFFF, w.v[3]), 3);
-    std::uint64_t bits = 0;
-    for (int k = 3; k >= 0; --k) bits = (bits << 16) | w.valid[k];
-    valid = bits;
   }
   ZUL_AVX512 std::uint64_t operator()(std::uint32_t c) const {
-    return _mm512_mask_cmpeq_epi8_mask(valid, b, _mm512_set1_epi8(static_cast<char>(c)));
+    return _mm512_cmpeq_epi8_mask(b, _mm512_set1_epi8(static_cast<char>(c)));
   }
 };
 
 // 16-bit lanes: two registers of 32.
 struct lanes16 {
   __m512i b[2];
-  __mmask32 valid[2];
   ZUL_AVX512 explicit lanes16(const b_lanes& w) {
     for (int h = 0; h < 2; ++h) {
       b[h] = _mm512_maskz_inserti64x4(
@@ -78,13 +73,12 @@ struct lanes16 {
           _mm512_maskz_inserti64x4(0xFF, _mm512_setzero_si512(),
                                    _mm512_maskz_cvtepi32_epi16(0xFFFF, w.v[2 * h]), 0),
           _mm512_maskz_cvtepi32_epi16(0xFFFF, w.v[2 * h + 1]), 1);
-      valid[h] = static_cast<__mmask32>(w.valid[2 * h] | (std::uint32_t{w.valid[2 * h + 1]} << 16));
     }
   }
   ZUL_AVX512 std::uint64_t operator()(std::uint32_t c) const {
     const __m512i x = _mm512_set1_epi16(static_cast<short>(c));
-    return std::uint64_t{_mm512_mask_cmpeq_epi16_mask(valid[0], b[0], x)} |
-           std::uint64_t{_mm512_mask_cmpeq_epi16_mask(valid[1], b[1], x)} << 32;
+    return std::uint64_t{_mm512_cmpeq_epi16_mask(b[0], x)} |
+           std::uint64_t{_mm512_cmpeq_epi16_mask(b[1], x)} << 32;
   }
 };
 
@@ -96,7 +90,7 @@ struct lanes32 {
     const __m512i x = _mm512_set1_epi32(static_cast<int>(c));
     std::uint64_t m = 0;
     for (int k = 0; k < 4; ++k) {
-      m |= std::uint64_t{_mm512_mask_cmpeq_epi32_mask(w.valid[k], w.v[k], x)} << (16 * k);
+      m |= std::uint64_t{_mm512_cmpeq_epi32_mask(w.v[k], x)} << (16 * k);
     }
     return m;
   }
@@ -118,7 +112,7 @@ ZUL_AVX512 jaro_counts match_with(const Positions& positions, const b_lanes& w,
     const std::size_t n = std::min<std::size_t>(16, reach.size() - start);
     for (std::size_t k = 0; k < n; ++k) {
       const std::size_t i = start + k;
-      open_in[k] = positions(reach[i]) & bound;
+      open_in[k] = positions(reach[i]) & bound & w.valid;  // lanes past b hold 0
       bound = (bound << 1) | (i < window ? 1 : 0);
     }
     for (std::size_t k = 0; k < n; ++k) {
@@ -153,9 +147,9 @@ ZUL_AVX512 jaro_counts match_word_avx512(std::span<const std::uint32_t> reach,
   b_lanes w;
   for (std::size_t k = 0; k < 4; ++k) {
     const std::size_t from = std::min(16 * k, b.size());
-    w.valid[k] = first_lanes(b.size() - from);
-    w.v[k] = _mm512_maskz_loadu_epi32(w.valid[k], b.data() + from);
+    w.v[k] = _mm512_maskz_loadu_epi32(first_lanes(b.size() - from), b.data() + from);
   }
+  w.valid = b.size() == 64 ? ~std::uint64_t{0} : (std::uint64_t{1} << b.size()) - 1;
   const __m512i used =
       _mm512_or_si512(or_of(b.data(), b.size()), or_of(reach.data(), reach.size()));
   if (fits(used, 8)) return match_with(lanes8(w), w, reach, window);
