@@ -34,15 +34,9 @@ ZUL_AVX512 __m512i or_of(const std::uint32_t* p, std::size_t n) {
   return _mm512_or_si512(m, _mm512_maskz_loadu_epi32(first_lanes(n - i), p + i));
 }
 
-// Whether every lane of v is below 2^bits.
-ZUL_AVX512 bool fits(__m512i v, int bits) {
-  return _mm512_test_epi32_mask(v, _mm512_set1_epi32(-(1 << bits))) == 0;
-}
-
-// b in 32-bit lanes, 16 per register; lanes at and beyond lb are zero.
+// b in 32-bit lanes, 16 per register; lanes at and beyond lb hold the pad.
 struct b_lanes {
   __m512i v[4];
-  std::uint64_t valid;  // bits 0 to lb - 1
 };
 
 // Position masks with b in byte lanes: one register, one compare.
@@ -112,7 +106,7 @@ ZUL_AVX512 jaro_counts match_with(const Positions& positions, const b_lanes& w,
     const std::size_t n = std::min<std::size_t>(16, reach.size() - start);
     for (std::size_t k = 0; k < n; ++k) {
       const std::size_t i = start + k;
-      open_in[k] = positions(reach[i]) & bound & w.valid;  // lanes past b hold 0
+      open_in[k] = positions(reach[i]) & bound;
       bound = (bound << 1) | (i < window ? 1 : 0);
     }
     for (std::size_t k = 0; k < n; ++k) {
@@ -120,21 +114,17 @@ ZUL_AVX512 jaro_counts match_with(const Positions& positions, const b_lanes& w,
       taken |= _blsi_u64(open_in[k] & ~taken);
     }
   }
-  alignas(64) std::uint32_t matched_b[64];
-  std::size_t filled = 0;
+  // The taken characters of each register of b, compressed to its front,
+  // against the matched characters of a of the same ranks.
+  jaro_counts counts;
   for (int k = 0; k < 4; ++k) {
     const auto part = static_cast<__mmask16>(taken >> (16 * k));
-    _mm512_storeu_si512(matched_b + filled, _mm512_maskz_compress_epi32(part, w.v[k]));
-    filled += static_cast<std::size_t>(_mm_popcnt_u32(part));
-  }
-  jaro_counts counts;
-  counts.matches = filled;
-  for (std::size_t k = 0; k < filled; k += 16) {
-    const __mmask16 live = first_lanes(filled - k);
-    const __mmask16 differ =
-        _mm512_mask_cmpneq_epi32_mask(live, _mm512_maskz_loadu_epi32(live, matched_a + k),
-                                      _mm512_maskz_loadu_epi32(live, matched_b + k));
-    counts.crossed += static_cast<std::size_t>(_mm_popcnt_u32(differ));
+    const __mmask16 live = first_lanes(static_cast<std::size_t>(_mm_popcnt_u32(part)));
+    const __m512i from_b = _mm512_maskz_compress_epi32(part, w.v[k]);
+    const __m512i from_a = _mm512_maskz_loadu_epi32(live, matched_a + counts.matches);
+    counts.crossed += static_cast<std::size_t>(
+        _mm_popcnt_u32(_mm512_mask_cmpneq_epi32_mask(live, from_a, from_b)));
+    counts.matches += static_cast<std::size_t>(_mm_popcnt_u32(part));
   }
   return counts;
 }
@@ -144,16 +134,26 @@ ZUL_AVX512 jaro_counts match_with(const Positions& positions, const b_lanes& w,
 ZUL_AVX512 jaro_counts match_word_avx512(std::span<const std::uint32_t> reach,
                                          std::span<const std::uint32_t> b,
                                          std::size_t window) noexcept {
+  // Lanes past the end of b hold a pad that equals no character of a or b:
+  // a bit that none of them has, so masks need no cut at lb. The narrowest
+  // lanes with such a bit to spare are used.
+  alignas(64) std::uint32_t lanes[16];
+  _mm512_store_si512(lanes,
+                     _mm512_or_si512(or_of(b.data(), b.size()), or_of(reach.data(), reach.size())));
+  std::uint32_t used = 0;
+  for (const std::uint32_t lane : lanes) used |= lane;
+  int bits = 8;
+  while (bits < 32 && (used >> bits != 0 || (~used & ((1u << bits) - 1)) == 0)) bits *= 2;
+  if (used == ~std::uint32_t{0}) return match_word_scalar(reach, b, window);
+  const std::uint32_t spare = ~used & (bits == 32 ? ~0u : (1u << bits) - 1);
+  const __m512i pad = _mm512_set1_epi32(static_cast<int>(spare & (0 - spare)));
   b_lanes w;
   for (std::size_t k = 0; k < 4; ++k) {
     const std::size_t from = std::min(16 * k, b.size());
-    w.v[k] = _mm512_maskz_loadu_epi32(first_lanes(b.size() - from), b.data() + from);
+    w.v[k] = _mm512_mask_loadu_epi32(pad, first_lanes(b.size() - from), b.data() + from);
   }
-  w.valid = b.size() == 64 ? ~std::uint64_t{0} : (std::uint64_t{1} << b.size()) - 1;
-  const __m512i used =
-      _mm512_or_si512(or_of(b.data(), b.size()), or_of(reach.data(), reach.size()));
-  if (fits(used, 8)) return match_with(lanes8(w), w, reach, window);
-  if (fits(used, 16)) return match_with(lanes16(w), w, reach, window);
+  if (bits == 8) return match_with(lanes8(w), w, reach, window);
+  if (bits == 16) return match_with(lanes16(w), w, reach, window);
   return match_with(lanes32(w), w, reach, window);
 }
 
