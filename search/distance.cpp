@@ -54,10 +54,15 @@ std::int64_t edit_distance_with(const Masks& masks, code_points pattern, code_po
 
 std::int64_t edit_distance_word(code_points pattern, code_points text) noexcept {
 #if defined(__SSE2__)
-  if (pattern.size() <= short_pattern_masks<2>::kMax) {
+  // Compares cost more per text character than a table lookup, so they pay
+  // when the table's set-up is not spread over a long text, or when the
+  // pattern has code points that the table would hash.
+  const bool compare = text.size() <= 64 || std::any_of(pattern.begin(), pattern.end(),
+                                                        [](std::uint32_t c) { return c >= 256; });
+  if (compare && pattern.size() <= short_pattern_masks<2>::kMax) {
     return edit_distance_with(short_pattern_masks<2>(pattern), pattern, text);
   }
-  if (pattern.size() <= short_pattern_masks<4>::kMax) {
+  if (compare && pattern.size() <= short_pattern_masks<4>::kMax) {
     return edit_distance_with(short_pattern_masks<4>(pattern), pattern, text);
   }
 #endif
