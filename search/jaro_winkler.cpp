@@ -205,8 +205,9 @@ jaro_counts match_word_scalar(code_points reach, code_points b, std::size_t wind
 const simd::family_tables<jaro_kernels>& jaro_tables() noexcept {
   static constexpr jaro_kernels kScalar{match_word_scalar};
 #if defined(__x86_64__) || defined(_M_X64)
+  static constexpr jaro_kernels kAvx2{match_word_avx2};
   static constexpr jaro_kernels kAvx512{match_word_avx512};
-  static constexpr simd::family_tables<jaro_kernels> kTables{&kScalar, nullptr, nullptr, &kAvx512,
+  static constexpr simd::family_tables<jaro_kernels> kTables{&kScalar, nullptr, &kAvx2, &kAvx512,
                                                              nullptr};
 #else
   static constexpr simd::family_tables<jaro_kernels> kTables{&kScalar};

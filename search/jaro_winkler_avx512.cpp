@@ -142,18 +142,16 @@ ZUL_AVX512 jaro_counts match_word_avx512(std::span<const std::uint32_t> reach,
                      _mm512_or_si512(or_of(b.data(), b.size()), or_of(reach.data(), reach.size())));
   std::uint32_t used = 0;
   for (const std::uint32_t lane : lanes) used |= lane;
-  int bits = 8;
-  while (bits < 32 && (used >> bits != 0 || (~used & ((1u << bits) - 1)) == 0)) bits *= 2;
-  if (used == ~std::uint32_t{0}) return match_word_scalar(reach, b, window);
-  const std::uint32_t spare = ~used & (bits == 32 ? ~0u : (1u << bits) - 1);
-  const __m512i pad = _mm512_set1_epi32(static_cast<int>(spare & (0 - spare)));
+  const lane_choice choice = choose_lanes(used);
+  if (choice.bits == 0) return match_word_scalar(reach, b, window);
+  const __m512i pad = _mm512_set1_epi32(static_cast<int>(choice.pad));
   b_lanes w;
   for (std::size_t k = 0; k < 4; ++k) {
     const std::size_t from = std::min(16 * k, b.size());
     w.v[k] = _mm512_mask_loadu_epi32(pad, first_lanes(b.size() - from), b.data() + from);
   }
-  if (bits == 8) return match_with(lanes8(w), w, reach, window);
-  if (bits == 16) return match_with(lanes16(w), w, reach, window);
+  if (choice.bits == 8) return match_with(lanes8(w), w, reach, window);
+  if (choice.bits == 16) return match_with(lanes16(w), w, reach, window);
   return match_with(lanes32(w), w, reach, window);
 }
 
