@@ -6,7 +6,7 @@
 // points. What stays serial is the taken mask: per character of a, AND-NOT,
 // lowest set bit, OR. Matched pairs are counted by compressing the taken
 // characters of b to the front and comparing them with the matched
-// characters of a, 16 at a time.
+// characters of a, 16 at a time (by a plain walk when there are few).
 #include "search/jaro_kernels.h"
 
 // The zero-masked forms of the conversions and inserts are used throughout:
@@ -21,6 +21,11 @@
 
 namespace zul::search::detail {
 namespace {
+
+// Up to this many matches a plain walk over the taken bits is quicker than
+// loading the matched characters of a back into vectors, which waits for
+// their stores.
+constexpr long long kScalarPairs = 16;
 
 ZUL_AVX512 inline __mmask16 first_lanes(std::size_t n) {
   return n >= 16 ? static_cast<__mmask16>(0xFFFF) : static_cast<__mmask16>((1u << n) - 1);
@@ -92,7 +97,8 @@ struct lanes32 {
 
 template <class Positions>
 ZUL_AVX512 jaro_counts match_with(const Positions& positions, const b_lanes& w,
-                                  std::span<const std::uint32_t> reach, std::size_t window) {
+                                  std::span<const std::uint32_t> reach,
+                                  std::span<const std::uint32_t> b, std::size_t window) {
   // bits max(0, i - window) to i + window of b: the window of position i.
   std::uint64_t bound = window >= 63 ? ~std::uint64_t{0} : (std::uint64_t{2} << window) - 1;
   std::uint64_t taken = 0;
@@ -117,6 +123,12 @@ ZUL_AVX512 jaro_counts match_with(const Positions& positions, const b_lanes& w,
   // The taken characters of each register of b, compressed to its front,
   // against the matched characters of a of the same ranks.
   jaro_counts counts;
+  if (_mm_popcnt_u64(taken) <= kScalarPairs) {
+    for (std::uint64_t bits = taken; bits != 0; bits = _blsr_u64(bits)) {
+      counts.crossed += matched_a[counts.matches++] != b[_tzcnt_u64(bits)] ? 1 : 0;
+    }
+    return counts;
+  }
   for (int k = 0; k < 4; ++k) {
     const auto part = static_cast<__mmask16>(taken >> (16 * k));
     const __mmask16 live = first_lanes(static_cast<std::size_t>(_mm_popcnt_u32(part)));
@@ -150,9 +162,9 @@ ZUL_AVX512 jaro_counts match_word_avx512(std::span<const std::uint32_t> reach,
     const std::size_t from = std::min(16 * k, b.size());
     w.v[k] = _mm512_mask_loadu_epi32(pad, first_lanes(b.size() - from), b.data() + from);
   }
-  if (choice.bits == 8) return match_with(lanes8(w), w, reach, window);
-  if (choice.bits == 16) return match_with(lanes16(w), w, reach, window);
-  return match_with(lanes32(w), w, reach, window);
+  if (choice.bits == 8) return match_with(lanes8(w), w, reach, b, window);
+  if (choice.bits == 16) return match_with(lanes16(w), w, reach, b, window);
+  return match_with(lanes32(w), w, reach, b, window);
 }
 
 }  // namespace zul::search::detail
