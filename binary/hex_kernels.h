@@ -22,6 +22,8 @@ const simd::family_tables<hex_kernels>& hex_tables() noexcept;
 
 void encode_hex_scalar(const std::uint8_t* in, std::size_t n, char* out) noexcept;
 void decode_hex_scalar(const char* in, std::size_t n, std::uint8_t* out) noexcept;
+void encode_hex_sse2(const std::uint8_t* in, std::size_t n, char* out) noexcept;
+void decode_hex_sse2(const char* in, std::size_t n, std::uint8_t* out) noexcept;
 void encode_hex_avx2(const std::uint8_t* in, std::size_t n, char* out) noexcept;
 void decode_hex_avx2(const char* in, std::size_t n, std::uint8_t* out) noexcept;
 void encode_hex_avx512(const std::uint8_t* in, std::size_t n, char* out) noexcept;
