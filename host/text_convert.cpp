@@ -1,12 +1,16 @@
 // The checks and fast paths shared by every platform: unknown encodings are
 // refused, a conversion to the same encoding is a copy, and text that is all
 // ASCII between two ASCII-compatible encodings is copied without the
-// system's converter (the common case in tests and benchmarks). Everything
-// else goes to the platform layer (iconv, or the Win32 code pages).
+// system's converter (the common case in tests and benchmarks). Mac OS Roman
+// goes through the host's own table (host/mac_roman.h), by way of UTF-32;
+// everything else goes to the platform layer (iconv, or the Win32 code
+// pages).
 #include "host/text_convert.h"
 
 #include <cstdio>
+#include <utility>
 
+#include "host/mac_roman.h"
 #include "host/platform.h"
 #include "plugin/host_types.h"
 
@@ -47,6 +51,16 @@ std::optional<std::string> convert_text(std::string_view bytes, std::uint32_t fr
   if (!known_encoding(from) || !known_encoding(to)) return std::nullopt;
   if (from == to) return std::string(bytes);
   if (ascii_compatible(from) && ascii_compatible(to) && all_ascii(bytes)) return std::string(bytes);
+  if (from == kMacRoman) {
+    std::string wide = mac_roman_to_utf32(bytes);
+    return to == kUTF32 ? std::optional<std::string>(std::move(wide))
+                        : platform::convert(wide, kUTF32, to);
+  }
+  if (to == kMacRoman) {
+    const std::optional<std::string> wide =
+        from == kUTF32 ? std::optional<std::string>(bytes) : platform::convert(bytes, from, kUTF32);
+    return wide ? utf32_to_mac_roman(*wide) : std::nullopt;
+  }
   return platform::convert(bytes, from, to);
 }
 

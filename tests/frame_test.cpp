@@ -298,6 +298,8 @@ struct custom : std::exception {
   const char* what() const noexcept override { return "custom"; }
 };
 
+// A null want_message expects the exception's own what(), for exceptions
+// the C++ runtime words itself (libstdc++ and libc++ differ).
 struct Row {
   void (*raise)();
   const char* want_class;
@@ -317,10 +319,10 @@ const Row kRows[] = {
        std::vector<char> v;
        v.reserve(v.max_size() + 1);
      },
-     "RuntimeException", "vector::reserve", "length_error is a logic_error"},
+     "RuntimeException", nullptr, "length_error is a logic_error"},
     {[] { throw std::invalid_argument("ia"); }, "RuntimeException", "ia", "other logic_error"},
     {[] { throw std::runtime_error("rt"); }, "RuntimeException", "rt", "other runtime_error"},
-    {[] { throw std::bad_any_cast(); }, "IllegalCastException", "bad any_cast", "bad_cast family"},
+    {[] { throw std::bad_any_cast(); }, "IllegalCastException", nullptr, "bad_cast family"},
     {[] { throw custom(); }, "RuntimeException", "custom", "other std::exception"},
     {[] { throw 42; }, "RuntimeException", "Sorry, but there was an unnamed C++ Exception.",
      "an int"},
@@ -330,11 +332,17 @@ const Row kRows[] = {
 // texts are copied out while the exception is still being handled.
 void expect_mapping(const Row& row, bool fail_allocations) {
   SCOPED_TRACE(row.why);
-  std::string got_class, got_message;
+  std::string got_class, got_message, what;
   try {
     row.raise();
     FAIL() << "nothing thrown";
   } catch (...) {
+    try {
+      throw;
+    } catch (const std::exception& e) {
+      what = e.what();
+    } catch (...) {
+    }
     TrappedError mapped{};
     if (fail_allocations) {
       zul::testing::fail_allocations guard;
@@ -346,7 +354,7 @@ void expect_mapping(const Row& row, bool fail_allocations) {
     got_message = mapped.message;
   }
   EXPECT_EQ(got_class, row.want_class);
-  EXPECT_EQ(got_message, row.want_message);
+  EXPECT_EQ(got_message, row.want_message ? row.want_message : what);
 }
 
 TEST(map_current_exception, classes_and_messages_in_order_allocating_nothing) {

@@ -1,0 +1,65 @@
+#include "host/mac_roman.h"
+
+#include <algorithm>
+#include <array>
+#include <cstdint>
+#include <cstring>
+#include <utility>
+
+namespace zul_host {
+namespace {
+
+// Characters of bytes 0x80 to 0xFF; bytes below 0x80 are ASCII.
+constexpr char32_t kHigh[128] = {
+    0x00C4, 0x00C5, 0x00C7, 0x00C9, 0x00D1, 0x00D6, 0x00DC, 0x00E1, 0x00E0, 0x00E2, 0x00E4, 0x00E3,
+    0x00E5, 0x00E7, 0x00E9, 0x00E8, 0x00EA, 0x00EB, 0x00ED, 0x00EC, 0x00EE, 0x00EF, 0x00F1, 0x00F3,
+    0x00F2, 0x00F4, 0x00F6, 0x00F5, 0x00FA, 0x00F9, 0x00FB, 0x00FC, 0x2020, 0x00B0, 0x00A2, 0x00A3,
+    0x00A7, 0x2022, 0x00B6, 0x00DF, 0x00AE, 0x00A9, 0x2122, 0x00B4, 0x00A8, 0x2260, 0x00C6, 0x00D8,
+    0x221E, 0x00B1, 0x2264, 0x2265, 0x00A5, 0x00B5, 0x2202, 0x2211, 0x220F, 0x03C0, 0x222B, 0x00AA,
+    0x00BA, 0x03A9, 0x00E6, 0x00F8, 0x00BF, 0x00A1, 0x00AC, 0x221A, 0x0192, 0x2248, 0x2206, 0x00AB,
+    0x00BB, 0x2026, 0x00A0, 0x00C0, 0x00C3, 0x00D5, 0x0152, 0x0153, 0x2013, 0x2014, 0x201C, 0x201D,
+    0x2018, 0x2019, 0x00F7, 0x25CA, 0x00FF, 0x0178, 0x2044, 0x20AC, 0x2039, 0x203A, 0xFB01, 0xFB02,
+    0x2021, 0x00B7, 0x201A, 0x201E, 0x2030, 0x00C2, 0x00CA, 0x00C1, 0x00CB, 0x00C8, 0x00CD, 0x00CE,
+    0x00CF, 0x00CC, 0x00D3, 0x00D4, 0xF8FF, 0x00D2, 0x00DA, 0x00DB, 0x00D9, 0x0131, 0x02C6, 0x02DC,
+    0x00AF, 0x02D8, 0x02D9, 0x02DA, 0x00B8, 0x02DD, 0x02DB, 0x02C7};
+
+// The same pairs sorted by character, for the way back.
+using Pair = std::pair<char32_t, unsigned char>;
+constexpr std::array<Pair, 128> sorted_by_character() {
+  std::array<Pair, 128> pairs{};
+  for (unsigned i = 0; i < 128; ++i) pairs[i] = {kHigh[i], static_cast<unsigned char>(0x80 + i)};
+  std::sort(pairs.begin(), pairs.end());
+  return pairs;
+}
+constexpr std::array<Pair, 128> kBack = sorted_by_character();
+
+}  // namespace
+
+std::string mac_roman_to_utf32(std::string_view bytes) {
+  std::string out(bytes.size() * 4, '\0');
+  for (std::size_t i = 0; i < bytes.size(); ++i) {
+    const auto b = static_cast<unsigned char>(bytes[i]);
+    const char32_t c = b < 0x80 ? b : kHigh[b - 0x80];
+    std::memcpy(out.data() + 4 * i, &c, 4);
+  }
+  return out;
+}
+
+std::optional<std::string> utf32_to_mac_roman(std::string_view utf32) {
+  if (utf32.size() % 4 != 0) return std::nullopt;
+  std::string out(utf32.size() / 4, '\0');
+  for (std::size_t i = 0; i < out.size(); ++i) {
+    char32_t c;
+    std::memcpy(&c, utf32.data() + 4 * i, 4);
+    if (c < 0x80) {
+      out[i] = static_cast<char>(c);
+      continue;
+    }
+    const auto at = std::lower_bound(kBack.begin(), kBack.end(), Pair{c, 0});
+    if (at == kBack.end() || at->first != c) return std::nullopt;
+    out[i] = static_cast<char>(at->second);
+  }
+  return out;
+}
+
+}  // namespace zul_host
