@@ -20,10 +20,12 @@
 #include "encodings/html.h"
 #include "encodings/html_tags.h"
 #include "encodings/quoted_printable.h"
+#include "encodings/sql.h"
 #include "encodings/url.h"
 #include "encodings/xml.h"
 #include "tests/reference/html_reference.h"
 #include "tests/reference/quoted_printable_reference.h"
+#include "tests/reference/sql_reference.h"
 #include "tests/reference/xml_reference.h"
 #include "text/latin1.h"
 #include "text/utf8_repair.h"
@@ -206,13 +208,12 @@ std::string codec_input_of(codec_input kind, std::size_t size, std::string_view 
 
 // Each codec keeps its result from the optimizer itself (results differ in
 // type).
-using byte_codec = void (*)(std::string_view, const zul::scan_kernels&);
+using byte_codec = void (*)(std::string_view, zul::simd::isa);
 
 void BM_codec(benchmark::State& state, byte_codec codec, codec_input kind, std::string specials,
               zul::simd::isa level) {
   const std::string in = codec_input_of(kind, static_cast<std::size_t>(state.range(0)), specials);
-  const zul::scan_kernels& scan = zul::scan_for(level);
-  for (auto _ : state) codec(in, scan);
+  for (auto _ : state) codec(in, level);
   state.SetBytesProcessed(static_cast<std::int64_t>(state.iterations()) * state.range(0));
 }
 
@@ -300,38 +301,51 @@ struct codec_row {
 };
 const codec_row kCodecs[] = {
     {"encode_url",
-     [](std::string_view in, const zul::scan_kernels& k) {
-       benchmark::DoNotOptimize(zul::encodings::encode_url(in, 1, zul::kMaxResultBytes, k));
+     [](std::string_view in, zul::simd::isa k) {
+       benchmark::DoNotOptimize(
+           zul::encodings::encode_url(in, 1, zul::kMaxResultBytes, zul::scan_for(k)));
      },
      " &/="},
     {"decode_url",
-     [](std::string_view in, const zul::scan_kernels& k) {
-       benchmark::DoNotOptimize(zul::encodings::decode_url(in, 1, k));
+     [](std::string_view in, zul::simd::isa k) {
+       benchmark::DoNotOptimize(zul::encodings::decode_url(in, 1, zul::scan_for(k)));
      },
      "+"},
     {"remove_html_tags",
-     [](std::string_view in, const zul::scan_kernels& k) {
-       benchmark::DoNotOptimize(zul::encodings::remove_html_tags(in, "", zul::kMaxResultBytes, k));
+     [](std::string_view in, zul::simd::isa k) {
+       benchmark::DoNotOptimize(
+           zul::encodings::remove_html_tags(in, "", zul::kMaxResultBytes, zul::scan_for(k)));
      },
      "<>"},
     {"encode_quoted_printable",
-     [](std::string_view in, const zul::scan_kernels& k) {
+     [](std::string_view in, zul::simd::isa k) {
        benchmark::DoNotOptimize(
-           zul::encodings::encode_quoted_printable(in, 76, zul::kMaxResultBytes, k));
+           zul::encodings::encode_quoted_printable(in, 76, zul::kMaxResultBytes, zul::scan_for(k)));
      },
      "=\n\xE9"},
     {"decode_quoted_printable",
-     [](std::string_view in, const zul::scan_kernels& k) {
-       benchmark::DoNotOptimize(zul::encodings::decode_quoted_printable(in, k));
+     [](std::string_view in, zul::simd::isa k) {
+       benchmark::DoNotOptimize(zul::encodings::decode_quoted_printable(in, zul::scan_for(k)));
      },
      "=\n"},
+    {"replace_sql_booleans",
+     [](std::string_view in, zul::simd::isa k) {
+       benchmark::DoNotOptimize(
+           zul::encodings::replace_sql_booleans(in, zul::encodings::detail::sql_kernels_for(k)));
+     },
+     " true 'x' "},
+    {"replace_sql_booleans_reference",
+     [](std::string_view in, zul::simd::isa) {
+       benchmark::DoNotOptimize(zul::reference::replace_sql_booleans_reference(in));
+     },
+     " true 'x' ", true},
     {"encode_quoted_printable_reference",
-     [](std::string_view in, const zul::scan_kernels&) {
+     [](std::string_view in, zul::simd::isa) {
        benchmark::DoNotOptimize(zul::reference::encode_quoted_printable_reference(in, 76));
      },
      "=\n\xE9", true},
     {"decode_quoted_printable_reference",
-     [](std::string_view in, const zul::scan_kernels&) {
+     [](std::string_view in, zul::simd::isa) {
        benchmark::DoNotOptimize(zul::reference::decode_quoted_printable_reference(in));
      },
      "=\n", true},

@@ -3,8 +3,9 @@
 // Invariants:
 //  1. no crash, no read outside the input (run under the sanitizers);
 //  2. every decoder accepts every byte sequence;
-//  3. fast paths equal their scalar references (URL, HTML, XML, yEnc, tag
-//     removal), at every kernel level the machine has;
+//  3. fast paths equal their scalar references (URL, HTML, XML,
+//     quoted-printable, yEnc, tag removal, SQL booleans), at every kernel
+//     level the machine has;
 //  4. decode(encode(x)) == x for URL with options 0 to 2, and for
 //     quoted-printable text without line breaks (those become CR LF / LF).
 #include <cstdint>
@@ -23,6 +24,8 @@
 #include "fuzz/fuzz_check.h"
 #include "tests/reference/html_reference.h"
 #include "tests/reference/html_tags_reference.h"
+#include "tests/reference/quoted_printable_reference.h"
+#include "tests/reference/sql_reference.h"
 #include "tests/reference/url_reference.h"
 #include "tests/reference/xml_reference.h"
 #include "tests/reference/yenc_reference.h"
@@ -81,7 +84,15 @@ extern "C" int LLVMFuzzerTestOneInput(const std::uint8_t* data, std::size_t size
       std::erase_if(flat, [](char c) { return c == '\r' || c == '\n'; });
       check(enc::decode_quoted_printable(enc::encode_quoted_printable(flat, 4 + options * 8)) ==
             flat);
-      (void)enc::decode_quoted_printable(in);
+      const std::string encoded =
+          zul::reference::encode_quoted_printable_reference(in, 4 + options * 8);
+      const std::string decoded = zul::reference::decode_quoted_printable_reference(in);
+      for (const zul::simd::isa level : zul::simd::supported_isas()) {
+        const zul::scan_kernels& scan = zul::scan_for(level);
+        check(enc::encode_quoted_printable(in, 4 + options * 8, zul::kMaxResultBytes, scan) ==
+              encoded);
+        check(enc::decode_quoted_printable(in, scan) == decoded);
+      }
       break;
     }
     default:
@@ -91,7 +102,10 @@ extern "C" int LLVMFuzzerTestOneInput(const std::uint8_t* data, std::size_t size
         check(enc::remove_html_tags(in, with, zul::kMaxResultBytes, zul::scan_for(level)) ==
               zul::reference::remove_html_tags_reference(in, with));
       }
-      (void)enc::replace_sql_booleans(in);
+      for (const zul::simd::isa level : zul::simd::supported_isas()) {
+        check(enc::replace_sql_booleans(in, enc::detail::sql_kernels_for(level)) ==
+              zul::reference::replace_sql_booleans_reference(in));
+      }
       break;
   }
   return 0;
