@@ -13,6 +13,7 @@
 #include <string>
 #include <vector>
 
+#include "binary/hex_dump.h"
 #include "binary/readable_runs.h"
 #include "common/bytes.h"
 #include "common/cpu.h"
@@ -23,6 +24,7 @@
 #include "encodings/sql.h"
 #include "encodings/url.h"
 #include "encodings/xml.h"
+#include "tests/reference/hex_dump_reference.h"
 #include "tests/reference/html_reference.h"
 #include "tests/reference/quoted_printable_reference.h"
 #include "tests/reference/sql_reference.h"
@@ -292,6 +294,9 @@ const code_point_codec_row kCodePointCodecs[] = {
      "&", true},
 };
 
+// The usual dump: 16 one-byte groups a line, spaced, one line end.
+const zul::binary::hex_dump_layout kDumpLayout{2, 16, "", "\n", " ", ""};
+
 // Each codec with the bytes that make it work; "scalar" is the plain scan.
 struct codec_row {
   const char* name;
@@ -339,6 +344,18 @@ const codec_row kCodecs[] = {
        benchmark::DoNotOptimize(zul::reference::replace_sql_booleans_reference(in));
      },
      " true 'x' ", true},
+    {"hex_dump",
+     [](std::string_view in, zul::simd::isa k) {
+       benchmark::DoNotOptimize(
+           zul::binary::hex_dump(zul::bytes_of(in), kDumpLayout,
+                                 zul::simd::kernels_for(zul::binary::detail::hex_tables(), k)));
+     },
+     "\xFF"},
+    {"hex_dump_reference",
+     [](std::string_view in, zul::simd::isa) {
+       benchmark::DoNotOptimize(zul::reference::hex_dump_reference(zul::bytes_of(in), kDumpLayout));
+     },
+     "\xFF", true},
     {"encode_quoted_printable_reference",
      [](std::string_view in, zul::simd::isa) {
        benchmark::DoNotOptimize(zul::reference::encode_quoted_printable_reference(in, 76));
