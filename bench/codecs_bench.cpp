@@ -20,12 +20,14 @@
 #include "common/scan.h"
 #include "encodings/html.h"
 #include "encodings/html_tags.h"
+#include "encodings/mail_subject.h"
 #include "encodings/quoted_printable.h"
 #include "encodings/sql.h"
 #include "encodings/url.h"
 #include "encodings/xml.h"
 #include "tests/reference/hex_dump_reference.h"
 #include "tests/reference/html_reference.h"
+#include "tests/reference/mail_subject_reference.h"
 #include "tests/reference/quoted_printable_reference.h"
 #include "tests/reference/sql_reference.h"
 #include "tests/reference/xml_reference.h"
@@ -344,6 +346,17 @@ const codec_row kCodecs[] = {
        benchmark::DoNotOptimize(zul::reference::replace_sql_booleans_reference(in));
      },
      " true 'x' ", true},
+    {"encode_mail_subject",
+     [](std::string_view in, zul::simd::isa k) {
+       benchmark::DoNotOptimize(
+           zul::encodings::encode_mail_subject(in, zul::kMaxResultBytes, zul::scan_for(k)));
+     },
+     " ?\xC3"},
+    {"encode_mail_subject_reference",
+     [](std::string_view in, zul::simd::isa) {
+       benchmark::DoNotOptimize(zul::reference::encode_mail_subject_reference(in));
+     },
+     " ?\xC3", true},
     {"hex_dump",
      [](std::string_view in, zul::simd::isa k) {
        benchmark::DoNotOptimize(
