@@ -30,7 +30,9 @@ constexpr std::size_t kBatchDigits = 16384;
 class short_text {
  public:
   explicit short_text(std::string_view text) : text_(text) {
-    if (text.size() <= sizeof padded_) std::memcpy(padded_, text.data(), text.size());
+    if (!text.empty() && text.size() <= sizeof padded_) {
+      std::memcpy(padded_, text.data(), text.size());
+    }
   }
   char* put(char* out) const {
     if (text_.size() <= sizeof padded_) {

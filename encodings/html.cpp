@@ -110,6 +110,7 @@ std::optional<std::uint32_t> reference_value(code_point_view name) {
 std::uint8_t* write_character(std::uint8_t* o, std::uint32_t c, const ascii_actions& actions) {
   if (c < 128) {
     const std::string_view text = actions[c];
+    if (text.empty()) return o;  // a dropped control
     std::memcpy(o, text.data(), text.size());
     return o + text.size();
   }
