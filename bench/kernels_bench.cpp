@@ -2,6 +2,8 @@
 // path, on 1 KiB, 1 MiB and 64 MiB, beside memcpy of the same size timed in
 // the same run: figures are read as a share of memcpy's bytes per second.
 // Inputs hold no match until the last byte, so each search scans it all.
+// Beside the kernels, the dispatched workers the adapters call ("/worker"),
+// result buffer included, on the same inputs.
 #include <benchmark/benchmark.h>
 
 #include <cstring>
@@ -10,11 +12,15 @@
 #include <string>
 #include <vector>
 
+#include "binary/bitwise.h"
 #include "binary/bitwise_kernels.h"
+#include "binary/hex.h"
 #include "binary/hex_kernels.h"
 #include "common/byte_set.h"
+#include "encodings/yenc.h"
 #include "encodings/yenc_kernels.h"
 #include "search/count_kernels.h"
+#include "text/char_class.h"
 #include "text/char_class_kernels.h"
 
 namespace {
@@ -145,10 +151,51 @@ void replace_non_printable_bench(benchmark::State& state, isa level) {
   set_bytes(state);
 }
 
+std::string_view chars(const std::vector<std::uint8_t>& v) {
+  return {reinterpret_cast<const char*>(v.data()), v.size()};
+}
+
+void encode_hex_worker(benchmark::State& state) {
+  const auto& in = text(state.range(0));
+  for (auto _ : state) benchmark::DoNotOptimize(zul::binary::encode_hex(in));
+  set_bytes(state);
+}
+
+void decode_hex_worker(benchmark::State& state) {
+  const auto& in = text(state.range(0));
+  for (auto _ : state) benchmark::DoNotOptimize(zul::binary::decode_hex(chars(in)));
+  set_bytes(state);
+}
+
+void decode_yenc_worker(benchmark::State& state) {
+  const auto& in = yenc_data(state.range(0));
+  for (auto _ : state) benchmark::DoNotOptimize(zul::encodings::decode_yenc(chars(in)));
+  set_bytes(state);
+}
+
+// XOR with a mask as long as the data (one kernel run, as xor_run).
+void xor_worker(benchmark::State& state) {
+  const auto& in = text(state.range(0));
+  const std::vector<std::uint8_t> mask(in.rbegin(), in.rend());
+  for (auto _ : state) benchmark::DoNotOptimize(zul::binary::xor_with_mask(in, mask, 0));
+  set_bytes(state);
+}
+
+void replace_non_printable_worker(benchmark::State& state) {
+  const auto& in = text(state.range(0));
+  for (auto _ : state) benchmark::DoNotOptimize(zul::text::replace_non_printable(in, '.'));
+  set_bytes(state);
+}
+
 void sizes(benchmark::internal::Benchmark* b) { b->Arg(1 << 10)->Arg(1 << 20)->Arg(64 << 20); }
 
 const bool registered = [] {
   sizes(benchmark::RegisterBenchmark("memcpy", BM_memcpy));
+  sizes(benchmark::RegisterBenchmark("encode_hex/worker", encode_hex_worker));
+  sizes(benchmark::RegisterBenchmark("decode_hex/worker", decode_hex_worker));
+  sizes(benchmark::RegisterBenchmark("decode_yenc/worker", decode_yenc_worker));
+  sizes(benchmark::RegisterBenchmark("xor_run/worker", xor_worker));
+  sizes(benchmark::RegisterBenchmark("replace_non_printable/worker", replace_non_printable_worker));
   for (isa level : supported_isas()) {
     const std::string name = isa_name(level);
     sizes(benchmark::RegisterBenchmark(("find_first_in_set_4/" + name).c_str(),

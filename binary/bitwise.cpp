@@ -81,32 +81,33 @@ void xor_positions(std::uint8_t* out, std::size_t n) {
 
 namespace {
 
-std::string combine(detail::bit_op op, bytes_view data, bytes_view mask, std::size_t start) {
-  std::string out(data.size(), '\0');
-  detail::combine_fast(op, data, mask, start, reinterpret_cast<std::uint8_t*>(out.data()));
+// One buffer of the data's size, written once by the run kernel.
+out_buffer combine(detail::bit_op op, bytes_view data, bytes_view mask, std::size_t start) {
+  out_buffer out(data.size());
+  detail::combine_fast(op, data, mask, start, out.extend(data.size()));
   return out;
 }
 
 }  // namespace
 
-std::string and_with_mask(bytes_view data, bytes_view mask) {
-  if (data.empty() || mask.empty()) return {};
+out_buffer and_with_mask(bytes_view data, bytes_view mask) {
+  if (data.empty() || mask.empty()) return out_buffer(0);
   return combine(detail::bit_op::kAnd, data, mask, 0);
 }
 
-std::string or_with_mask(bytes_view data, bytes_view mask) {
-  if (data.empty() || mask.empty()) return {};
+out_buffer or_with_mask(bytes_view data, bytes_view mask) {
+  if (data.empty() || mask.empty()) return out_buffer(0);
   return combine(detail::bit_op::kOr, data, mask, 0);
 }
 
-std::string xor_with_mask(bytes_view data, bytes_view mask, std::int64_t offset) {
-  if (data.empty() || mask.empty()) return {};
+out_buffer xor_with_mask(bytes_view data, bytes_view mask, std::int64_t offset) {
+  if (data.empty() || mask.empty()) return out_buffer(0);
   return combine(detail::bit_op::kXor, data, mask, detail::mask_start(offset, mask.size()));
 }
 
-std::string xor_with_mask_and_position(bytes_view data, bytes_view mask, std::int64_t offset) {
-  std::string out = xor_with_mask(data, mask, offset);
-  detail::xor_positions(reinterpret_cast<std::uint8_t*>(out.data()), out.size());
+out_buffer xor_with_mask_and_position(bytes_view data, bytes_view mask, std::int64_t offset) {
+  out_buffer out = xor_with_mask(data, mask, offset);
+  detail::xor_positions(out.data(), out.size());
   return out;
 }
 

@@ -8,27 +8,27 @@
 #include <cstddef>
 #include <cstdint>
 #include <span>
-#include <string>
 
 #include "common/bytes.h"
+#include "common/out_buffer.h"
 
 namespace zul::binary {
 
 // data[i] AND mask[i mod m]. Empty data or an empty mask give "".
-std::string and_with_mask(bytes_view data, bytes_view mask);
+out_buffer and_with_mask(bytes_view data, bytes_view mask);
 
 // data[i] OR mask[i mod m]. Empty data or an empty mask give "".
-std::string or_with_mask(bytes_view data, bytes_view mask);
+out_buffer or_with_mask(bytes_view data, bytes_view mask);
 
 // data[i] XOR mask[(offset + i) mod m]. The offset is reduced modulo the mask
 // length, floored (-1 is the last mask byte), so the mask position never
 // leaves the mask. Applying it twice with the same mask and offset gives the
 // data back. Empty data or an empty mask give "".
-std::string xor_with_mask(bytes_view data, bytes_view mask, std::int64_t offset);
+out_buffer xor_with_mask(bytes_view data, bytes_view mask, std::int64_t offset);
 
 // As xor_with_mask, then each byte is also XORed with the low eight bits of
 // its own position (0, 1, ..., 255, 0, ...). Its own inverse, too.
-std::string xor_with_mask_and_position(bytes_view data, bytes_view mask, std::int64_t offset);
+out_buffer xor_with_mask_and_position(bytes_view data, bytes_view mask, std::int64_t offset);
 
 namespace detail {
 

@@ -1,8 +1,9 @@
-// Hex encoding and decoding run the machine's hex kernels (byte shuffles,
-// binary/hex_kernels_x86.cpp). The scalar path, their fallback and tail,
-// turns four bytes at a time into eight digits inside one 64-bit word
-// (SWAR), finishing through a 256-entry table of digit pairs; it decodes
-// through the shared value table in which every non-digit is 0.
+// Hex encoding and decoding run the machine's hex kernels (byte shuffles in
+// binary/hex_kernels_x86.cpp, SSE2 arithmetic in hex_kernels_sse2.cpp). The
+// scalar path, their fallback and tail, turns four bytes at a time into
+// eight digits inside one 64-bit word (SWAR), finishing through a 256-entry
+// table of digit pairs; it decodes through the shared value table in which
+// every non-digit is 0.
 #include "binary/hex.h"
 
 #include <array>
@@ -77,9 +78,10 @@ void decode_hex_scalar(const char* in, std::size_t n, std::uint8_t* out) noexcep
 namespace {
 constexpr hex_kernels kScalar{encode_hex_scalar, decode_hex_scalar, spaced_pairs_scalar};
 #if defined(__x86_64__) || defined(_M_X64)
+constexpr hex_kernels kSse2{encode_hex_sse2, decode_hex_sse2, spaced_pairs_scalar};
 constexpr hex_kernels kAvx2{encode_hex_avx2, decode_hex_avx2, spaced_pairs_avx2};
 constexpr hex_kernels kAvx512{encode_hex_avx512, decode_hex_avx512, spaced_pairs_avx2};
-constexpr simd::family_tables<hex_kernels> kTables{&kScalar, nullptr, &kAvx2, &kAvx512, nullptr};
+constexpr simd::family_tables<hex_kernels> kTables{&kScalar, &kSse2, &kAvx2, &kAvx512, nullptr};
 #else
 constexpr simd::family_tables<hex_kernels> kTables{&kScalar};
 #endif
@@ -90,17 +92,18 @@ const simd::family_tables<hex_kernels>& hex_tables() noexcept { return kTables; 
 
 }  // namespace detail
 
-std::string encode_hex(std::span<const std::uint8_t> bytes) {
-  std::string out(2 * bytes.size(), '\0');
+out_buffer encode_hex(std::span<const std::uint8_t> bytes) {
+  out_buffer out(2 * bytes.size());
+  char* digits = reinterpret_cast<char*>(out.extend(2 * bytes.size()));
   simd::active(detail::hex_tables(), detail::active_kernels)
-      .encode(bytes.data(), bytes.size(), out.data());
+      .encode(bytes.data(), bytes.size(), digits);
   return out;
 }
 
-std::string decode_hex(std::string_view text) {
-  std::string out(text.size() / 2, '\0');
-  simd::active(detail::hex_tables(), detail::active_kernels)
-      .decode(text.data(), out.size(), reinterpret_cast<std::uint8_t*>(out.data()));
+out_buffer decode_hex(std::string_view text) {
+  const std::size_t n = text.size() / 2;
+  out_buffer out(n);
+  simd::active(detail::hex_tables(), detail::active_kernels).decode(text.data(), n, out.extend(n));
   return out;
 }
 

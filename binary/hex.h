@@ -9,13 +9,16 @@
 #include <string>
 #include <string_view>
 
+#include "common/out_buffer.h"
+
 namespace zul::binary {
 
-// 2 * bytes.size() upper-case digits; "" for no bytes.
-std::string encode_hex(std::span<const std::uint8_t> bytes);
+// 2 * bytes.size() upper-case digits; "" for no bytes. The result is written
+// once into a buffer of its exact size. Throws std::bad_alloc.
+out_buffer encode_hex(std::span<const std::uint8_t> bytes);
 
 // text.size() / 2 bytes, each from the digit pair at 2k, 2k + 1 (non-digits
 // count 0); "" when text has fewer than two characters.
-std::string decode_hex(std::string_view text);
+out_buffer decode_hex(std::string_view text);
 
 }  // namespace zul::binary

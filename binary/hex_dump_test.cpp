@@ -9,16 +9,13 @@
 #include <string_view>
 #include <vector>
 
+#include "common/bytes.h"
 #include "tests/reference/hex_dump_reference.h"
 
 namespace zul::binary {
 namespace {
 
 using namespace std::string_view_literals;
-
-std::span<const std::uint8_t> bytes(std::string_view s) {
-  return {reinterpret_cast<const std::uint8_t*>(s.data()), s.size()};
-}
 
 // The layout as a model: the whole digit text H with linelen * hexlen filler
 // copies after the digits, walked while the position is inside the digits.
@@ -54,7 +51,7 @@ TEST(hex_dump, matches_model) {
           for (std::string_view spacer : {""sv, ", "sv}) {
             const hex_dump_layout l{hexlen, linelen, "[", "]\n", spacer, filler};
             const std::string_view part(in.data(), n);
-            ASSERT_EQ(hex_dump(bytes(part), l), model_dump(part, l))
+            ASSERT_EQ(hex_dump(bytes_of(part), l), model_dump(part, l))
                 << n << " " << hexlen << " " << linelen << " '" << filler << "' '" << spacer << "'";
           }
         }
@@ -85,7 +82,7 @@ TEST(hex_dump, oversize_gives_empty) {
     const std::uint64_t want = row.want > kMaxDumpLength ? 0 : row.want;
     EXPECT_EQ(detail::hex_dump_length(row.n, row.layout), want);
   }
-  EXPECT_EQ(hex_dump(bytes("x"), {1 << 20, 1 << 20, "", "", "", ""}), "");
+  EXPECT_EQ(hex_dump(bytes_of("x"), {1 << 20, 1 << 20, "", "", "", ""}), "");
 }
 
 // Every hex kernel against the reference, on layouts that take the

@@ -25,6 +25,8 @@ const simd::family_tables<hex_kernels>& hex_tables() noexcept;
 
 void encode_hex_scalar(const std::uint8_t* in, std::size_t n, char* out) noexcept;
 void decode_hex_scalar(const char* in, std::size_t n, std::uint8_t* out) noexcept;
+void encode_hex_sse2(const std::uint8_t* in, std::size_t n, char* out) noexcept;
+void decode_hex_sse2(const char* in, std::size_t n, std::uint8_t* out) noexcept;
 void spaced_pairs_scalar(const std::uint8_t* in, std::size_t n, char spacer, char* out) noexcept;
 void spaced_pairs_avx2(const std::uint8_t* in, std::size_t n, char spacer, char* out) noexcept;
 void encode_hex_avx2(const std::uint8_t* in, std::size_t n, char* out) noexcept;

@@ -7,35 +7,19 @@
 #include <string>
 #include <string_view>
 
+#include "common/bytes.h"
 #include "common/cpu.h"
 #include "tests/sweep.h"
 
 namespace zul::binary {
 namespace {
 
-std::span<const std::uint8_t> bytes(std::string_view s) {
-  return {reinterpret_cast<const std::uint8_t*>(s.data()), s.size()};
-}
-
-// Length of the readable unit at s[i], by decoding the code point: the model
-// that the lead-byte table must agree with.
+// Length of the readable unit at s[i]: printable ASCII, tab, line feed and
+// carriage return, or a well-formed multi-byte character.
 std::size_t model_unit(std::string_view s, std::size_t i) {
   const auto b = static_cast<unsigned char>(s[i]);
-  if (b == 9 || b == 10 || b == 13 || (b >= 0x20 && b <= 0x7E)) return 1;
-  std::size_t len = b >= 0xF0 && b < 0xF8   ? 4
-                    : b >= 0xE0 && b < 0xF0 ? 3
-                    : b >= 0xC0 && b < 0xE0 ? 2
-                                            : 0;
-  if (len == 0 || i + len > s.size()) return 0;
-  std::uint32_t cp = b & (0x7F >> len);
-  for (std::size_t k = 1; k < len; ++k) {
-    const auto c = static_cast<unsigned char>(s[i + k]);
-    if ((c & 0xC0) != 0x80) return 0;
-    cp = cp << 6 | (c & 0x3F);
-  }
-  const std::uint32_t min[] = {0, 0, 0x80, 0x800, 0x10000};
-  if (cp < min[len] || cp > 0x10FFFF || (cp >= 0xD800 && cp <= 0xDFFF)) return 0;
-  return len;
+  if (b < 0x80) return b == 9 || b == 10 || b == 13 || (b >= 0x20 && b <= 0x7E) ? 1 : 0;
+  return testing_sweep::utf8_model_length(bytes_of(s.substr(i)));
 }
 
 std::size_t model_run(std::string_view s) {
@@ -60,7 +44,7 @@ TEST(measure_run, agrees_with_decoding_model) {
                         static_cast<char>(d)};
           for (std::size_t cut = 1; cut <= 4; cut += 3) {
             const std::string_view v(s.data(), cut);
-            ASSERT_EQ(detail::measure_run(bytes(v), 0).length, model_run(v))
+            ASSERT_EQ(detail::measure_run(bytes_of(v), 0).length, model_run(v))
                 << std::hex << a << " " << b << " " << int{c} << " " << int{d} << " cut " << cut;
           }
         }
@@ -85,7 +69,7 @@ TEST(measure_run, every_scan_level_with_an_ending_byte_everywhere) {
     testing_sweep::special_byte_sweep(specials, 100, [&](const std::string& in) {
       for (const std::string& s : {in, in + "\xC3\xA9" + in, std::string(70, ' ') + in}) {
         for (std::size_t pos = 0; pos < s.size() && pos < 2; ++pos) {
-          const detail::run_measure got = detail::measure_run(bytes(s), pos, scan_for(level));
+          const detail::run_measure got = detail::measure_run(bytes_of(s), pos, scan_for(level));
           const std::string_view from = std::string_view(s).substr(pos);
           ASSERT_EQ(got.length, model_run(from));
           ASSERT_EQ(got.visible, model_visible(from.substr(0, got.length)));

@@ -1,6 +1,7 @@
 // Byte-set search: the scalar path (the fallback and the reference of the
-// kernels) and the one-time choice of kernel. SSE2 alone has no byte shuffle,
-// so the SSE2 level uses the scalar path; AVX2, AVX-512 and NEON shuffle.
+// kernels) and the one-time choice of kernel. SSE2 alone has no byte
+// shuffle, so its kernel compares with the set's ranges; SSSE3, AVX2,
+// AVX-512 and NEON shuffle.
 #include "common/byte_set.h"
 
 #include <atomic>
@@ -45,11 +46,17 @@ namespace {
 constexpr byte_set_kernels kScalar{find_first_in_set_scalar, find_first_code_point_scalar,
                                    narrow_until_member_scalar};
 #if defined(__x86_64__) || defined(_M_X64)
+// The SSE2 and SSSE3 levels search code-point lanes on the scalar path.
+constexpr byte_set_kernels kSse2{find_first_in_set_sse2, find_first_code_point_scalar,
+                                 narrow_until_member_scalar};
+constexpr byte_set_kernels kSsse3{find_first_in_set_ssse3, find_first_code_point_scalar,
+                                  narrow_until_member_scalar};
 constexpr byte_set_kernels kAvx2{find_first_in_set_avx2, find_first_code_point_avx2,
                                  narrow_until_member_avx2};
 constexpr byte_set_kernels kAvx512{find_first_in_set_avx512, find_first_code_point_avx512,
                                    narrow_until_member_avx512};
-constexpr family_tables<byte_set_kernels> kTables{&kScalar, nullptr, &kAvx2, &kAvx512, nullptr};
+constexpr family_tables<byte_set_kernels> kTables{&kScalar, &kSse2,  &kAvx2,
+                                                  &kAvx512, nullptr, &kSsse3};
 #elif defined(__aarch64__)
 // Code-point lanes take the scalar path on arm64 for now.
 constexpr byte_set_kernels kNeon{find_first_in_set_neon, find_first_code_point_scalar,

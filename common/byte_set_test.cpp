@@ -62,7 +62,13 @@ TEST(find_first_in_set, every_single_byte_set) {
 // at every misalignment, with one hit placed at every position or none.
 TEST(find_first_in_set, length_and_alignment_sweep) {
   const std::vector<std::vector<std::uint8_t>> sets = {
-      {0x00}, {'<', '>', '&', '"'}, {0x7F, 0x80}, {0xFF, 0x0F, 0xF0, 0x10, 0x8F, 0x70}, [] {
+      {0x00},
+      {'<', '>', '&', '"'},
+      {0x7F, 0x80},
+      {0xFF, 0x0F, 0xF0, 0x10, 0x8F, 0x70},
+      // Eight ranges, the most the range compares take, with both ends.
+      {0x00, 0x01, 0x10, 0x33, 0x30, 0x31, 0x32, 0x7F, 0x80, 0xA0, 0xC0, 0xE0, 0xFF, 0xFE},
+      [] {
         std::vector<std::uint8_t> all;
         for (int b = 0x20; b < 0xC0; b += 3) all.push_back(static_cast<std::uint8_t>(b));
         return all;
@@ -107,6 +113,30 @@ TEST(find_first_in_set, random_sets_and_buffers_agree_with_the_model) {
     EXPECT_EQ(find_first_in_set(set, buf), want);
     for_each_kernel([&](const detail::byte_set_kernels& k) {
       ASSERT_EQ(k.find_first(set, buf.data(), buf.size()), want);
+    });
+  }
+}
+
+// Sets built from ranges and single bytes in random order: every kernel
+// finds what the membership bits say, whatever ranges the set kept.
+TEST(find_first_in_set, sets_of_ranges_agree_with_membership) {
+  std::mt19937 rng(5);
+  std::vector<std::uint8_t> buf(700);
+  for (int round = 0; round < 400; ++round) {
+    byte_set set;
+    for (unsigned parts = rng() % 12; parts-- > 0;) {
+      const auto a = static_cast<std::uint8_t>(rng()), b = static_cast<std::uint8_t>(rng() % 8);
+      if (rng() % 2) {
+        set.add_range(a, static_cast<std::uint8_t>(a + b < 256 ? a + b : 255));
+      } else {
+        set.add(a);
+      }
+    }
+    for (auto& c : buf) c = static_cast<std::uint8_t>(rng());
+    const std::size_t n = rng() % buf.size();
+    const std::size_t want = detail::find_first_in_set_scalar(set, buf.data(), n);
+    for_each_kernel([&](const detail::byte_set_kernels& k) {
+      ASSERT_EQ(k.find_first(set, buf.data(), n), want) << "round " << round;
     });
   }
 }

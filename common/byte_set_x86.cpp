@@ -1,5 +1,5 @@
-// Byte-set search kernels for x86-64, compiled per function for AVX2 and
-// AVX-512 (BW) so the rest of the library stays at the SSE2 baseline.
+// Byte-set search kernels for x86-64, compiled per function for SSSE3, AVX2
+// and AVX-512 (BW) so the rest of the library stays at the SSE2 baseline.
 //
 // Membership of byte v in one shuffle round (exact for any set):
 //   row = shuffle(low_rows, v) | shuffle(high_rows, v ^ 0x80)
@@ -22,11 +22,36 @@
 #if defined(__x86_64__) || defined(_M_X64)
 #include <immintrin.h>
 
+#define ZUL_SSSE3 __attribute__((target("ssse3")))
 #define ZUL_AVX2 __attribute__((target("avx2,bmi,bmi2")))
 #define ZUL_AVX512 __attribute__((target("avx2,bmi,bmi2,avx512f,avx512bw,avx512vl,avx512dq")))
 
 namespace zul::simd::detail {
 namespace {
+
+struct tables128 {
+  __m128i low, high, bits, nibble, top;
+};
+
+ZUL_SSSE3 inline tables128 load_tables128(const byte_set& set) {
+  return {_mm_load_si128(reinterpret_cast<const __m128i*>(set.low_rows())),
+          _mm_load_si128(reinterpret_cast<const __m128i*>(set.high_rows())),
+          _mm_setr_epi8(1, 2, 4, 8, 16, 32, 64, -128, 1, 2, 4, 8, 16, 32, 64, -128),
+          _mm_set1_epi8(0x0F), _mm_set1_epi8(static_cast<char>(0x80))};
+}
+
+// 0xFF in each lane whose byte is a member.
+ZUL_SSSE3 inline __m128i members128(const tables128& t, __m128i v) {
+  const __m128i row =
+      _mm_or_si128(_mm_shuffle_epi8(t.low, v), _mm_shuffle_epi8(t.high, _mm_xor_si128(v, t.top)));
+  const __m128i bit = _mm_shuffle_epi8(t.bits, _mm_and_si128(_mm_srli_epi16(v, 4), t.nibble));
+  return _mm_cmpeq_epi8(_mm_and_si128(row, bit), bit);
+}
+
+ZUL_SSSE3 inline unsigned mask128(const tables128& t, const std::uint8_t* p) {
+  const __m128i v = _mm_loadu_si128(reinterpret_cast<const __m128i*>(p));
+  return static_cast<unsigned>(_mm_movemask_epi8(members128(t, v)));
+}
 
 struct tables256 {
   __m256i low, high, bits, nibble, top;
@@ -81,6 +106,29 @@ ZUL_AVX512 inline __mmask64 members512(const tables512& t, __m512i v) {
 }
 
 }  // namespace
+
+ZUL_SSSE3 std::size_t find_first_in_set_ssse3(const byte_set& set, const std::uint8_t* p,
+                                              std::size_t n) noexcept {
+  if (n < 16) return find_first_in_set_scalar(set, p, n);
+  const tables128 t = load_tables128(set);
+  std::size_t i = 0;
+  for (; n - i >= 32; i += 32) {
+    const __m128i a = members128(t, _mm_loadu_si128(reinterpret_cast<const __m128i*>(p + i)));
+    const __m128i b = members128(t, _mm_loadu_si128(reinterpret_cast<const __m128i*>(p + i + 16)));
+    if (_mm_movemask_epi8(_mm_or_si128(a, b)) != 0) {
+      const unsigned m = static_cast<unsigned>(_mm_movemask_epi8(a)) |
+                         static_cast<unsigned>(_mm_movemask_epi8(b)) << 16;
+      return i + static_cast<std::size_t>(__builtin_ctz(m));
+    }
+  }
+  if (n - i >= 16) {
+    if (const unsigned m = mask128(t, p + i)) return i + __builtin_ctz(m);
+    i += 16;
+  }
+  if (i == n) return n;
+  const unsigned m = mask128(t, p + n - 16);
+  return m ? n - 16 + __builtin_ctz(m) : n;
+}
 
 ZUL_AVX2 std::size_t find_first_in_set_avx2(const byte_set& set, const std::uint8_t* p,
                                             std::size_t n) noexcept {

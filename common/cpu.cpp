@@ -18,6 +18,7 @@ namespace zul::simd {
 namespace {
 
 struct features {
+  bool ssse3 = false;
   bool avx2 = false;
   bool avx512 = false;
   bool vbmi2 = false;
@@ -45,8 +46,10 @@ features detect() noexcept {
   unsigned r[4];
   cpuid(0, 0, r);
   const unsigned max_leaf = r[0];
-  if (max_leaf < 7) return f;
+  if (max_leaf < 1) return f;
   cpuid(1, 0, r);
+  f.ssse3 = (r[2] >> 9) & 1;
+  if (max_leaf < 7) return f;
   const bool osxsave = (r[2] >> 27) & 1;
   const bool avx = (r[2] >> 28) & 1;
   const bool fma = (r[2] >> 12) & 1;
@@ -68,7 +71,7 @@ features detect() noexcept {
 #endif
 
 struct levels {
-  std::array<isa, 4> list{};
+  std::array<isa, 5> list{};
   std::uint8_t count = 0;
   bool vbmi2 = false;
 };
@@ -79,6 +82,7 @@ levels compute() noexcept {
 #if defined(__x86_64__) || defined(_M_X64)
   const features f = detect();
   l.list[l.count++] = isa::sse2;
+  if (f.ssse3) l.list[l.count++] = isa::ssse3;
   if (f.avx2) l.list[l.count++] = isa::avx2;
   if (f.avx512) l.list[l.count++] = isa::avx512;
   l.vbmi2 = f.vbmi2;
@@ -103,6 +107,8 @@ const char* isa_name(isa level) noexcept {
       return "scalar";
     case isa::sse2:
       return "sse2";
+    case isa::ssse3:
+      return "ssse3";
     case isa::avx2:
       return "avx2";
     case isa::avx512:

@@ -10,10 +10,12 @@
 namespace zul::simd {
 
 // Ordered from the most portable to the most capable on each architecture.
-enum class isa : std::uint8_t { scalar, sse2, avx2, avx512, neon };
+// SSSE3 adds the byte shuffle that SSE2 lacks (every x86-64 Mac has it; some
+// PCs without AVX2 have it too).
+enum class isa : std::uint8_t { scalar, sse2, ssse3, avx2, avx512, neon };
 
-// Name for tests, benchmarks and zul: "scalar", "sse2", "avx2", "avx512",
-// "neon".
+// Name for tests, benchmarks and zul: "scalar", "sse2", "ssse3", "avx2",
+// "avx512", "neon".
 const char* isa_name(isa level) noexcept;
 
 // Every level this machine can run, scalar first and the best last.

@@ -14,7 +14,8 @@
 namespace zul::simd {
 
 // The tables one family implements; null where a level has no kernels of
-// its own (the next lower level's table serves it).
+// its own (the next lower level's table serves it). SSSE3 comes last so the
+// few families with an SSSE3 table name it and the others need not.
 template <class Table>
 struct family_tables {
   const Table* scalar = nullptr;
@@ -22,6 +23,7 @@ struct family_tables {
   const Table* avx2 = nullptr;
   const Table* avx512 = nullptr;
   const Table* neon = nullptr;
+  const Table* ssse3 = nullptr;
 };
 
 // The table for `level`, or the best lower level the family implements.
@@ -34,6 +36,9 @@ const Table& kernels_for(const family_tables<Table>& t, isa level) noexcept {
       [[fallthrough]];
     case isa::avx2:
       if (t.avx2) return *t.avx2;
+      [[fallthrough]];
+    case isa::ssse3:
+      if (t.ssse3) return *t.ssse3;
       [[fallthrough]];
     case isa::sse2:
       if (t.sse2) return *t.sse2;

@@ -25,7 +25,7 @@ TEST(supported_isas, scalar_first_best_last) {
 }
 
 TEST(kernels_for, falls_back_to_the_best_lower_level) {
-  static const table s{0}, sse{1}, avx512{3}, neon{4};
+  static const table s{0}, sse{1}, avx512{3}, neon{4}, ssse3{5};
   struct row {
     family_tables<table> tables;
     isa asked;
@@ -39,6 +39,9 @@ TEST(kernels_for, falls_back_to_the_best_lower_level) {
       {{&s, &sse, nullptr, nullptr, &neon}, isa::neon, 4, "own neon"},
       {{&s, &sse, nullptr, nullptr, nullptr}, isa::neon, 0, "neon never takes x86"},
       {{&s, &sse, nullptr, nullptr, nullptr}, isa::scalar, 0, "scalar asked"},
+      {{&s, &sse, nullptr, nullptr, nullptr}, isa::ssse3, 1, "ssse3 served by sse2"},
+      {{&s, &sse, nullptr, nullptr, nullptr, &ssse3}, isa::avx512, 5, "avx512 served by ssse3"},
+      {{&s, &sse, nullptr, nullptr, nullptr, &ssse3}, isa::sse2, 1, "sse2 skips ssse3"},
   };
   for (const row& r : rows) {
     SCOPED_TRACE(r.why);
@@ -47,7 +50,7 @@ TEST(kernels_for, falls_back_to_the_best_lower_level) {
 }
 
 TEST(isa_name, distinct) {
-  const isa all[] = {isa::scalar, isa::sse2, isa::avx2, isa::avx512, isa::neon};
+  const isa all[] = {isa::scalar, isa::sse2, isa::ssse3, isa::avx2, isa::avx512, isa::neon};
   for (isa a : all) {
     for (isa b : all) {
       if (a != b) {

@@ -49,6 +49,8 @@ class out_buffer {
 
   std::size_t size() const noexcept { return size_; }
   const std::uint8_t* data() const noexcept { return data_; }
+  // The result's bytes, for a second pass in place.
+  std::uint8_t* data() noexcept { return data_; }
   std::string_view view() const noexcept { return {reinterpret_cast<const char*>(data_), size_}; }
   // The result, for builders and comparisons that take a string view.
   operator std::string_view() const noexcept { return view(); }  // NOLINT: implicit on purpose
@@ -80,6 +82,17 @@ class out_buffer {
   std::uint8_t* tail() noexcept { return data_ + size_; }
   // Counts n bytes written at tail() as part of the result.
   void commit(std::size_t n) noexcept { size_ += n; }
+
+  // Grows the result by n bytes that the caller then writes at the returned
+  // pointer: for results whose size is known up front (reserve it in the
+  // constructor and this costs no allocation). Throws std::bad_alloc when n
+  // would pass limit + kSlack.
+  std::uint8_t* extend(std::size_t n) {
+    if (!ensure(n)) throw std::bad_alloc();
+    std::uint8_t* at = data_ + size_;
+    size_ += n;
+    return at;
+  }
 
   // Appends n bytes; the room must have been ensured.
   void put(const void* bytes, std::size_t n) noexcept {

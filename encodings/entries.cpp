@@ -180,7 +180,7 @@ REALmemoryBlock yDecodeZULm(REALmemoryBlock data) noexcept {
   return quietly<REALmemoryBlock>(nullptr, [&]() -> REALmemoryBlock {
     rbData in(data);
     if (in.length < 1 || !in.data) return nullptr;
-    const std::string decoded = enc::decode_yenc(in.view());
+    const zul::out_buffer decoded = enc::decode_yenc(in.view());
     // The block builder raises its own exception when the block cannot be had.
     return REALNewMemoryBlock(static_cast<std::int64_t>(decoded.size()), decoded.data());
   });

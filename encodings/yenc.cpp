@@ -1,8 +1,9 @@
-// yEnc decoding runs the machine's kernel (encodings/yenc_x86.cpp:
-// AVX-512 VBMI2 compress). The scalar path, fallback and tail: runs between
-// "=" escapes are a plain subtraction of 42, which the compiler vectorises;
-// escapes are handled one at a time. One output buffer of the input's size,
-// trimmed at the end.
+// yEnc decoding runs the machine's kernel (AVX-512 VBMI2 compress in
+// encodings/yenc_x86.cpp, table-driven packing for SSSE3 and AVX2 in
+// yenc_pack_x86.cpp). The scalar path, fallback and tail: runs between "="
+// escapes are a plain subtraction of 42, which the compiler vectorises;
+// escapes are handled one at a time. One output buffer of the input's size, reserved and never
+// zero-filled; the result is the part written.
 #include "encodings/yenc.h"
 
 #include <atomic>
@@ -36,6 +37,8 @@ std::size_t decode_yenc_scalar(const std::uint8_t* p, std::size_t n, std::uint8_
 namespace {
 constexpr yenc_kernels kScalar{decode_yenc_scalar};
 #if defined(__x86_64__) || defined(_M_X64)
+constexpr yenc_kernels kSsse3{decode_yenc_ssse3};
+constexpr yenc_kernels kAvx2{decode_yenc_avx2};
 constexpr yenc_kernels kVbmi2{decode_yenc_avx512_vbmi2};
 #endif
 std::atomic<const yenc_kernels*> active_kernels{nullptr};
@@ -47,6 +50,8 @@ const simd::family_tables<yenc_kernels>& yenc_tables() noexcept {
     simd::family_tables<yenc_kernels> t;
     t.scalar = &kScalar;
 #if defined(__x86_64__) || defined(_M_X64)
+    t.ssse3 = &kSsse3;
+    t.avx2 = &kAvx2;
     if (simd::has_avx512_vbmi2()) t.avx512 = &kVbmi2;
 #endif
     return t;
@@ -56,12 +61,11 @@ const simd::family_tables<yenc_kernels>& yenc_tables() noexcept {
 
 }  // namespace detail
 
-std::string decode_yenc(std::string_view in) {
-  std::string out(in.size(), '\0');
-  const std::size_t written = simd::active(detail::yenc_tables(), detail::active_kernels)
-                                  .decode(reinterpret_cast<const std::uint8_t*>(in.data()),
-                                          in.size(), reinterpret_cast<std::uint8_t*>(out.data()));
-  out.resize(written);
+out_buffer decode_yenc(std::string_view in) {
+  out_buffer out(in.size());
+  std::uint8_t* o = out.tail();
+  out.commit(simd::active(detail::yenc_tables(), detail::active_kernels)
+                 .decode(reinterpret_cast<const std::uint8_t*>(in.data()), in.size(), o));
   return out;
 }
 

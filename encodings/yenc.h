@@ -4,13 +4,14 @@
 // modulo 256. CR and LF are data like any other byte.
 #pragma once
 
-#include <string>
 #include <string_view>
+
+#include "common/out_buffer.h"
 
 namespace zul::encodings {
 
 // Decodes in. A final "=" decodes as if a zero byte followed it (0x96).
 // Output is never longer than the input.
-std::string decode_yenc(std::string_view in);
+out_buffer decode_yenc(std::string_view in);
 
 }  // namespace zul::encodings

@@ -61,7 +61,7 @@ void check_classes(std::span<const std::uint8_t> data, std::uint8_t replacement)
   for (auto cls : {byte_class::seven_bit, byte_class::printable, byte_class::non_control}) {
     check(all_bytes_in(data, cls) == zul::reference::all_bytes_in_reference(data, cls));
   }
-  const std::string replaced = replace_non_printable(data, replacement);
+  const std::string replaced(replace_non_printable(data, replacement).view());
   check(replaced.size() == data.size());
   for (std::size_t i = 0; i < data.size(); ++i) {
     const bool kept = data[i] >= 0x20 && data[i] <= 0x7F;

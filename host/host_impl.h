@@ -16,6 +16,7 @@
 #include <string>
 #include <thread>
 #include <unordered_map>
+#include <unordered_set>
 #include <vector>
 
 #include "host/host.h"
@@ -79,6 +80,9 @@ struct HostState {
   std::vector<ModuleRecord*> module_records;  // owned; freed at destruction
 
   std::unordered_map<const void*, std::unique_ptr<HostObject>> objects;  // live + quarantined
+  // The live ones alone, so the ledger check after each call costs what is
+  // alive, not what the quarantine holds.
+  std::unordered_set<const HostObject*> live;
   std::deque<HostObject*> quarantine;
   std::uint64_t next_object_id = 1;
 

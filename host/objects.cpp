@@ -66,6 +66,7 @@ HostObject* HostState::make(Kind kind, const char* made_by) {
   o->thread = std::this_thread::get_id();
   o->made_by = made_by;
   objects.emplace(o, std::move(object));
+  live.insert(o);
   return o;
 }
 
@@ -112,6 +113,7 @@ void HostState::drop_ref(HostObject* o) {
 
 void HostState::destroy(HostObject* o) {
   o->destroyed = true;
+  live.erase(o);
   if (config.bench) {
     // Freed at once, as a host frees it: no poisoning, no quarantine.
     std::vector<HostObject*> children;
@@ -197,10 +199,8 @@ std::string HostState::report_ledger() {
   const auto self = std::this_thread::get_id();
   std::vector<std::string> lines = t.problems;
   std::vector<const HostObject*> alive;
-  for (const auto& [handle, o] : objects) {
-    if (!o->destroyed && o->thread == self && o->id >= t.object_mark) {
-      alive.push_back(o.get());
-    }
+  for (const HostObject* o : live) {
+    if (o->thread == self && o->id >= t.object_mark) alive.push_back(o);
   }
   std::sort(alive.begin(), alive.end(), [](auto* a, auto* b) { return a->id < b->id; });
   for (const HostObject* o : alive) {

@@ -39,9 +39,10 @@ std::uint64_t count_pattern_scalar(const std::uint8_t* p, std::size_t n, const s
 namespace {
 constexpr count_kernels kScalar{count_byte_scalar, count_pattern_scalar};
 #if defined(__x86_64__) || defined(_M_X64)
+constexpr count_kernels kSse2{count_byte_sse2, count_pattern_sse2};
 constexpr count_kernels kAvx2{count_byte_avx2, count_pattern_avx2};
 constexpr count_kernels kAvx512{count_byte_avx512, count_pattern_avx512};
-constexpr simd::family_tables<count_kernels> kTables{&kScalar, nullptr, &kAvx2, &kAvx512, nullptr};
+constexpr simd::family_tables<count_kernels> kTables{&kScalar, &kSse2, &kAvx2, &kAvx512, nullptr};
 #else
 constexpr simd::family_tables<count_kernels> kTables{&kScalar};
 #endif

@@ -24,8 +24,6 @@ using zul_host::StrArray;
 using zul_host::tagged;
 using zul_host::utf8;
 
-inline const char* decl(int row) { return kDeclarations[row - 1]; }
-
 // What a call gave, as text, and whether it is the function's empty result.
 struct outcome {
   std::string text;

@@ -19,8 +19,6 @@ using zul_host::StrArray;
 using zul_host::tagged;
 using zul_host::utf8;
 
-// Declarations by their row in the method table (numbered from 1).
-const char* decl(int row) { return kDeclarations[row - 1]; }
 const char *kRunsP = decl(1), *kRunsM = decl(2), *kRunsS = decl(3), *kRandom = decl(14),
            *kCreate = decl(15), *kAND = decl(23), *kOR = decl(24), *kXOR = decl(25),
            *kXOR2 = decl(26), *kDump = decl(40), *kToHex = decl(45), *kFromHex = decl(46),
@@ -28,9 +26,6 @@ const char *kRunsP = decl(1), *kRunsM = decl(2), *kRunsS = decl(3), *kRandom = d
 
 const Str none = zul_host::null_string();
 Str raw(std::string_view bytes) { return tagged(bytes, kUnknown); }
-std::string describe(const Str& s) {
-  return s.null ? "null" : "\"" + s.bytes + "\" encoding " + std::to_string(s.encoding);
-}
 
 // One call, made as the table is built, and the result it must give.
 struct row {
@@ -38,10 +33,7 @@ struct row {
   const char* why;
 };
 void check(std::initializer_list<row> rows) {
-  for (const row& r : rows) {
-    const bool same = r.got.null ? r.want.null : !r.want.null && r.got == r.want;
-    EXPECT_TRUE(same) << r.why << ": got " << describe(r.got) << ", want " << describe(r.want);
-  }
+  for (const row& r : rows) EXPECT_TRUE(same(r.got, r.want)) << r.why;
 }
 
 using Binary = HostTest;
@@ -103,8 +95,7 @@ TEST_F(Binary, concat_create_random) {
 }
 
 TEST_F(Binary, hex) {
-  std::string all;
-  for (int b = 0; b < 256; ++b) all += static_cast<char>(b);
+  const std::string all = all_bytes();
   check({
       {call<Str>(kToHex, raw("\x00\x7F\x80\xFF"sv)), ascii("007F80FF"), "upper case"},
       {call<Str>(kToHex, tagged("\xE9", kLatin1)), ascii("E9"), "stored bytes, not characters"},
@@ -197,15 +188,12 @@ TEST_F(Binary, readable_runs_without_data) {
 
 // A host that cannot hand out a memory block's bytes: the block reads as no
 // data, and is still unlocked afterwards (the ledger checks it).
-class BinaryWithoutBlockBytes : public HostTest {
- protected:
-  BinaryWithoutBlockBytes() : HostTest(config()) {}
-  static zul_host::HostConfig config() {
-    zul_host::HostConfig c;
-    c.missing = {"REALLoadObjectMethod", "memoryBlockGetPtr"};
-    return c;
-  }
-};
+zul_host::HostConfig without_block_bytes() {
+  zul_host::HostConfig config;
+  config.missing = {"REALLoadObjectMethod", "memoryBlockGetPtr"};
+  return config;
+}
+using BinaryWithoutBlockBytes = HostTestWith<without_block_bytes>;
 
 TEST_F(BinaryWithoutBlockBytes, block_reads_as_no_data) {
   EXPECT_TRUE(call<StrArray>(kRunsM, Block{"Hello", false}, k0).null);

@@ -78,3 +78,6 @@ inline constexpr const char* kDeclarations[] = {
     "integer, StartValue2 as integer, EndValue2 as integer, StartValue3 as integer, EndValue3 as "
     "integer) as integer",
 };
+
+// The declaration of a row of the method table, numbered from 1.
+inline const char* decl(int row) { return kDeclarations[row - 1]; }

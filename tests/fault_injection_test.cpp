@@ -19,7 +19,6 @@
 
 namespace {
 
-using all_functions::decl;
 using all_functions::Host;
 using all_functions::outcome;
 

@@ -1,12 +1,19 @@
 // The frame compiled into this test binary, pointed at the stand-in host's
 // resolver: result strings from every encoding path, rbText's forms and
-// rbData's holders. Every test ends with the host's ledger balanced.
+// rbData's holders, exceptions raised to the host. Every such test ends with
+// the host's ledger balanced. Also the two failure policies and the trap's
+// mapping from C++ exceptions to host exception classes and messages, in
+// order (the specific kinds before their base classes), also with every
+// allocation failing.
 #include <gtest/gtest.h>
 
+#include <any>
 #include <cstring>
+#include <new>
 #include <optional>
 #include <stdexcept>
 #include <string>
+#include <typeinfo>
 #include <vector>
 
 #include "host/host.h"
@@ -15,6 +22,7 @@
 #include "plugin/rb_data.h"
 #include "plugin/rb_text.h"
 #include "plugin/results.h"
+#include "tests/failing_allocator.h"
 
 namespace {
 
@@ -71,12 +79,7 @@ TEST_F(Frame, build_string_tags_and_ascii_demotion) {
       {"a\xE9", enc::kASCII, {"a\xE9", enc::kASCII}, "ASCII passed through as given"},
       {"abc", enc::kUTF8, {"abc", enc::kUTF8}, "UTF-8 is never demoted"},
       {"abc", enc::kLatin1, {"abc", enc::kLatin1}, "other encodings unchanged"},
-      {utf16({0xE9, 0x41}),
-       enc::kUTF16,
-       {"\xC3\xA9"
-        "A",
-        enc::kUTF8},
-       "UTF-16 becomes UTF-8"},
+      {utf16({0xE9, 'z'}), enc::kUTF16, {"\xC3\xA9z", enc::kUTF8}, "UTF-16 becomes UTF-8"},
       {utf32({0x1F600}), enc::kUTF32, {"\xF0\x9F\x98\x80", enc::kUTF8}, "UTF-32 becomes UTF-8"},
   };
   for (const auto& row : rows) {
@@ -136,24 +139,15 @@ TEST_F(Frame, text_view_forms) {
   } rows[] = {
       {{"Hi", enc::kWindowsLatin1}, "Hi", {'H', 'i'}, true, "ASCII shortcut"},
       {{"", enc::kUTF8}, "", {}, true, "empty string"},
-      {{"A\xE9", enc::kUnknown},
-       "A\xC3\x88",
-       {'A', 0xC8},
-       false,
-       "unknown bytes read as Mac OS Roman"},
+      {{"A\xE9", enc::kUnknown}, "A\xC3\x88", {'A', 0xC8}, false, "unknown bytes: Mac OS Roman"},
       {{"A\xE9", enc::kLatin1}, "A\xC3\xA9", {'A', 0xE9}, false, "Latin 1"},
       {{"\x80", enc::kWindowsLatin1}, "\xE2\x82\xAC", {0x20AC}, false, "Windows Latin 1 euro"},
-      {{utf16({0xFEFF, 'A'}), enc::kUTF16},
-       "\xEF\xBB\xBF"
-       "A",
-       {'A'},
+      {{utf16({0xFEFF, 'z'}), enc::kUTF16},
+       "\xEF\xBB\xBFz",
+       {'z'},
        false,
-       "the mark stays in UTF-8 but not in UTF-32"},
-      {{"A\xF0\x9F\x98\x80", enc::kUTF8},
-       "A\xF0\x9F\x98\x80",
-       {'A', 0x1F600},
-       false,
-       "non-BMP is one unit"},
+       "mark kept in UTF-8 only"},
+      {{"A\xF0\x9F\x98\x80", enc::kUTF8}, "A\xF0\x9F\x98\x80", {'A', 0x1F600}, false, "non-BMP"},
   };
   for (const auto& row : rows) {
     SCOPED_TRACE(row.why);
@@ -298,6 +292,89 @@ TEST_F(Frame, trap_raises_and_returns_the_empty_result) {
             std::optional(zul_host::RaisedException{"OutOfBoundsException", "index 9", 0}));
   EXPECT_EQ(trapped(-1, [] { return 7; }), 7);
   EXPECT_FALSE(host_.take_pending_exception().has_value());
+}
+
+struct custom : std::exception {
+  const char* what() const noexcept override { return "custom"; }
+};
+
+struct Row {
+  void (*raise)();
+  const char* want_class;
+  const char* want_message;
+  const char* why;
+};
+
+const Row kRows[] = {
+    {[] { throw std::bad_alloc(); }, "OutOfMemoryException", "Failed to allocate memory.",
+     "allocation"},
+    {[] { throw std::range_error("r"); }, "OutOfBoundsException", "r", "range_error"},
+    {[] { throw std::out_of_range("o"); }, "OutOfBoundsException", "o",
+     "out_of_range before logic_error"},
+    {[] { throw std::overflow_error("ov"); }, "OutOfBoundsException", "ov", "overflow_error"},
+    {[] { throw std::underflow_error("un"); }, "OutOfBoundsException", "un", "underflow_error"},
+    {[] {
+       std::vector<char> v;
+       v.reserve(v.max_size() + 1);
+     },
+     "RuntimeException", "vector::reserve", "length_error is a logic_error"},
+    {[] { throw std::invalid_argument("ia"); }, "RuntimeException", "ia", "other logic_error"},
+    {[] { throw std::runtime_error("rt"); }, "RuntimeException", "rt", "other runtime_error"},
+    {[] { throw std::bad_any_cast(); }, "IllegalCastException", "bad any_cast", "bad_cast family"},
+    {[] { throw custom(); }, "RuntimeException", "custom", "other std::exception"},
+    {[] { throw 42; }, "RuntimeException", "Sorry, but there was an unnamed C++ Exception.",
+     "an int"},
+};
+
+// Maps the exception that row raises, with allocation failing or not. The
+// texts are copied out while the exception is still being handled.
+void expect_mapping(const Row& row, bool fail_allocations) {
+  SCOPED_TRACE(row.why);
+  std::string got_class, got_message;
+  try {
+    row.raise();
+    FAIL() << "nothing thrown";
+  } catch (...) {
+    TrappedError mapped{};
+    if (fail_allocations) {
+      zul::testing::fail_allocations guard;
+      mapped = map_current_exception();
+    } else {
+      mapped = map_current_exception();
+    }
+    got_class = mapped.class_name;
+    got_message = mapped.message;
+  }
+  EXPECT_EQ(got_class, row.want_class);
+  EXPECT_EQ(got_message, row.want_message);
+}
+
+TEST(map_current_exception, classes_and_messages_in_order_allocating_nothing) {
+  for (const bool fail_allocations : {false, true}) {
+    for (const Row& row : kRows) expect_mapping(row, fail_allocations);
+  }
+}
+
+// With no host attached nothing is raised; what matters is that neither
+// policy allocates (or ends the process) once the body has thrown.
+TEST(policies, give_the_empty_result_when_memory_is_gone) {
+  int raised = 0, silent = 0, passed = 0;
+  bool allocation_failed = false;
+  {
+    zul::testing::fail_allocations guard;
+    raised = trapped(-1, []() -> int { throw std::bad_alloc(); });
+    silent = quietly(-1, []() -> int { throw std::bad_alloc(); });
+    passed = trapped(-1, []() -> int { return 7; });
+    try {
+      ::operator delete(::operator new(1));
+    } catch (const std::bad_alloc&) {
+      allocation_failed = true;
+    }
+  }
+  EXPECT_EQ(raised, -1);
+  EXPECT_EQ(silent, -1);
+  EXPECT_EQ(passed, 7);
+  EXPECT_TRUE(allocation_failed);
 }
 
 }  // namespace

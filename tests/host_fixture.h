@@ -1,6 +1,6 @@
 // Test fixture: a fresh stand-in host with the shipped plug-in loaded, and a
 // call() that fails the test when the host's ledger is not balanced after
-// the call.
+// the call; the wanted results and inputs the end-to-end tables use.
 #pragma once
 
 #include <gtest/gtest.h>
@@ -62,3 +62,19 @@ class HostTest : public ::testing::Test {
 
   zul_host::Host host_;
 };
+
+// A HostTest whose host has the configuration that Configure() returns.
+template <zul_host::HostConfig (*Configure)()>
+class HostTestWith : public HostTest {
+ protected:
+  HostTestWith() : HostTest(Configure()) {}
+};
+
+// Every byte value in order, rounds times over.
+inline std::string all_bytes(int rounds = 1) {
+  std::string s;
+  for (int round = 0; round < rounds; ++round) {
+    for (int b = 0; b < 256; ++b) s += static_cast<char>(b);
+  }
+  return s;
+}

@@ -1,10 +1,13 @@
 // Inputs for comparing a worker's vector paths with its reference: plain
 // filler of every length up to a few vector widths with one special byte at
 // every position, and the same length made only of that byte, so that each
-// kernel meets the byte in every lane, at block edges and in the tail.
+// kernel meets the byte in every lane, at block edges and in the tail. Also
+// a UTF-8 model that decodes the code point, for the table-driven checkers.
 #pragma once
 
 #include <cstddef>
+#include <cstdint>
+#include <span>
 #include <string>
 #include <string_view>
 
@@ -34,6 +37,25 @@ inline std::string every_byte_value() {
   std::string s;
   for (int b = 0; b < 256; ++b) s += std::string("a") + static_cast<char>(b) + "b";
   return s;
+}
+
+// Length of the well-formed UTF-8 sequence that s starts with, 0 when it
+// starts with none: decodes the bits and asks whether the code point is in
+// range, not a surrogate and encoded in its shortest form.
+inline std::size_t utf8_model_length(std::span<const std::uint8_t> s) {
+  if (s.empty()) return 0;
+  const std::uint8_t c = s[0];
+  if (c < 0x80) return 1;
+  const std::size_t len = c >= 0xF0 ? 4 : c >= 0xE0 ? 3 : c >= 0xC0 ? 2 : 0;
+  if (len == 0 || c >= 0xF8 || s.size() < len) return 0;
+  std::uint32_t cp = c & (0x7F >> len);
+  for (std::size_t k = 1; k < len; ++k) {
+    if ((s[k] & 0xC0) != 0x80) return 0;
+    cp = (cp << 6) | (s[k] & 0x3F);
+  }
+  const std::size_t shortest = cp < 0x80 ? 1 : cp < 0x800 ? 2 : cp < 0x10000 ? 3 : 4;
+  if (shortest != len || cp > 0x10FFFF || (cp >= 0xD800 && cp <= 0xDFFF)) return 0;
+  return len;
 }
 
 }  // namespace zul::testing_sweep

@@ -165,11 +165,7 @@ TEST(run_zul, statuses_and_output) {
     const char* why;
   } rows[] = {
       {{"call", "FakeEchoZUL", "hi"}, 0, "hi\n", "", "string result"},
-      {{"call", "FakeSumZUL", "1", "0.5", "true", "hex:02", "abc"},
-       0,
-       "7.5\n",
-       "",
-       "every argument type"},
+      {{"call", "FakeSumZUL", "1", "0.5", "true", "hex:02", "abc"}, 0, "7.5\n", "", "every type"},
       {{"call", "FakeSumZUL", "1", "x", "true", "a", "b"}, 2, "", "fit no overload", "bad double"},
       {{"call", "FakeSplitZUL", "@null"}, 0, "one\ntwo\n", "", "array"},
       {{"call", "FakeBlockZUL", "2"}, 0, "zz\n", "", "memory block"},
@@ -180,11 +176,7 @@ TEST(run_zul, statuses_and_output) {
       {{"frobnicate"}, 2, "", "usage", "unknown command"},
       {{"--host-version", "soon", "list"}, 2, "", "--host-version", "bad version"},
       {{"--plugin", "/no/such.so", "list"}, 3, "", "cannot read", "missing plug-in"},
-      {{"--host-version", "none", "call", "FakeEchoZUL", "hex:41"},
-       0,
-       "A\n",
-       "",
-       "per-method host"},
+      {{"--host-version", "none", "call", "FakeEchoZUL", "hex:41"}, 0, "A\n", "", "old host"},
       {{"call", "FakeEchoZUL", "hi", "--verbose"}, 0, "hi\n", "called FakeEchoZUL", "option last"},
       {{"call", "--verbose", "FakeEchoZUL", "hi"}, 0, "hi\n", "called", "option after call"},
       {{"list", "--host-version", "none"},
@@ -193,11 +185,8 @@ TEST(run_zul, statuses_and_output) {
        "",
        "option after list"},
       {{"call", "FakeEchoZUL", "--", "--verbose"}, 0, "--verbose\n", "", "-- ends the options"},
-      {{"call", "FakeEchoZUL", "hi", "--plugin"},
-       2,
-       "",
-       "incomplete option",
-       "option value missing"},
+      {{"call", "FakeEchoZUL", "hex:"}, 0, "\n", "", "no hex digits: the empty string"},
+      {{"call", "FakeEchoZUL", "hi", "--plugin"}, 2, "", "incomplete option", "no value"},
   };
   for (const auto& row : rows) {
     SCOPED_TRACE(row.why);
@@ -224,26 +213,20 @@ TEST(run_zul, bad_command_lines_are_reported_never_crash) {
     std::string want_err_part;
     const char* why;
   } rows[] = {
-      {{"call", "EncodingToHexZUL", "file:" + dir},
-       "argument 1 (file:" + dir + "): is a directory",
-       "a directory for file:"},
-      {{"call", "EncodingToHexZUL", "file:" + dir + "/zul-no-such-file"},
-       "no such file",
-       "a missing file"},
+      {{"call", "EncodingToHexZUL", "file:" + dir}, "1 (file:" + dir + "): is a directory", "dir"},
+      {{"call", "EncodingToHexZUL", "file:" + dir + "/zul-none"}, "no such file", "missing file"},
       {{"call", "EncodingToHexZUL", "file:/dev/null"}, "not a regular file", "a device"},
       {{"call", "CheckUTF8ZUL", "hex:41", "100000000", "?"},
        "argument 2 (size): 100000000 is more than the 1 byte that argument 1 (data) holds",
        "ptr size beyond the bytes given"},
       {{"call", "GetStringsFromDataZUL", "hex:4142", "3", "0"},
        "more than the 2 bytes",
-       "ptr size one past the bytes"},
-      {{"call", "EncodingToHexZUL", "hex:4G"},
-       "'G' at position 2 of the digits is not a hex digit",
-       "a non-hex digit"},
+       "one past"},
+      {{"call", "EncodingToHexZUL", "hex:4G"}, "'G' at position 2 of the digits is not", "not hex"},
       {{"call", "EncodingToHexZUL", "hex:414"}, "an odd number of hex digits (3)", "odd digits"},
       {{"call", "StringXORZUL", "a", "b", "x"},
-       "argument 3 (MaskOffset): 'x' is not a valid",
-       "an integer that is none"},
+       "argument 3 (MaskOffset): 'x' is not",
+       "no integer"},
       {{"call", "InStrBytesZUL", "a"}, "argument 2 (find) is missing", "too few arguments"},
       {{"call", "InStrBytesZUL", "a", "b", "c"}, "takes 2 arguments, given 3", "too many"},
   };
@@ -281,14 +264,6 @@ TEST(run_zul, bench_prints_figures_and_host_conversions) {
   EXPECT_EQ(zul({"bench", "--seconds", "0.02", "FakeRaiseZUL", "boom"}).status, 1);
   EXPECT_EQ(zul({"bench", "--seconds", "0", "FakeEchoZUL", "x"}).status, 2);
   EXPECT_EQ(zul({"bench", "FakeEchoZUL", "hex:4"}).status, 2);
-}
-
-TEST(argument_problem, hex_and_file_forms) {
-  EXPECT_EQ(argument_problem("hex:C3a9"), "");
-  EXPECT_EQ(argument_problem("hex:"), "");
-  EXPECT_EQ(argument_problem("plain text"), "");
-  EXPECT_EQ(argument_problem("hex:0x"), "'x' at position 2 of the digits is not a hex digit");
-  EXPECT_EQ(argument_problem("file:/dev/null"), "is not a regular file");
 }
 
 TEST(zul_tool, runs_as_a_program) {

@@ -93,10 +93,10 @@ bool all_bytes_in(std::span<const std::uint8_t> bytes, byte_class cls) noexcept 
   return simd::find_first_in_set(outside(cls), bytes) == bytes.size();
 }
 
-std::string replace_non_printable(std::span<const std::uint8_t> bytes, std::uint8_t replacement) {
-  std::string out(bytes.size(), '\0');
-  detail::active_char_class_kernels().replace_non_printable(
-      bytes.data(), bytes.size(), replacement, reinterpret_cast<std::uint8_t*>(out.data()));
+out_buffer replace_non_printable(std::span<const std::uint8_t> bytes, std::uint8_t replacement) {
+  out_buffer out(bytes.size());
+  detail::active_char_class_kernels().replace_non_printable(bytes.data(), bytes.size(), replacement,
+                                                            out.extend(bytes.size()));
   return out;
 }
 

@@ -7,7 +7,8 @@
 #include <cstdint>
 #include <optional>
 #include <span>
-#include <string>
+
+#include "common/out_buffer.h"
 
 namespace zul::text {
 
@@ -23,6 +24,6 @@ bool all_bytes_in(std::span<const std::uint8_t> bytes, byte_class cls) noexcept;
 
 // A copy of bytes of the same length with every byte outside 20..7F
 // replaced by replacement. Throws std::bad_alloc.
-std::string replace_non_printable(std::span<const std::uint8_t> bytes, std::uint8_t replacement);
+out_buffer replace_non_printable(std::span<const std::uint8_t> bytes, std::uint8_t replacement);
 
 }  // namespace zul::text

@@ -59,7 +59,7 @@ REALstring ReplaceNonPrintableCharactersZUL(REALstring s, std::int64_t replace_v
   return quietly<REALstring>(nullptr, [&]() -> REALstring {
     rbData bytes(s);
     if (bytes.empty() || !zul::fits_result(bytes.bytes().size())) return nullptr;
-    const std::string out = zul::text::replace_non_printable(
+    const zul::out_buffer out = zul::text::replace_non_printable(
         bytes.bytes(), static_cast<std::uint8_t>(replace_value & 0xFF));
     return build_string(out, kASCII);
   });

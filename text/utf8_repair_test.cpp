@@ -15,14 +15,14 @@
 #include <string>
 #include <string_view>
 
+#include "common/bytes.h"
 #include "tests/reference/utf8_repair_reference.h"
+#include "tests/sweep.h"
 
 namespace zul::text {
 namespace {
 
-bytes_view b(std::string_view s) {
-  return {reinterpret_cast<const std::uint8_t*>(s.data()), s.size()};
-}
+using namespace std::string_view_literals;
 
 const simd::utf8_kernels& kernels(simd::isa level) {
   return simd::kernels_for(simd::utf8_tables(), level);
@@ -30,9 +30,9 @@ const simd::utf8_kernels& kernels(simd::isa level) {
 
 // Every kernel level repairs in as the reference does.
 void expect_all_levels_match(std::string_view in, std::string_view placeholder) {
-  const std::string want = reference::repair_utf8_reference(b(in), placeholder);
+  const std::string want = reference::repair_utf8_reference(bytes_of(in), placeholder);
   for (const simd::isa level : simd::supported_isas()) {
-    ASSERT_EQ(repair_utf8(b(in), placeholder, kMaxResultBytes, kernels(level)).view(), want)
+    ASSERT_EQ(repair_utf8(bytes_of(in), placeholder, kMaxResultBytes, kernels(level)).view(), want)
         << simd::isa_name(level);
   }
 }
@@ -60,34 +60,18 @@ TEST(repair_utf8, table_boundaries) {
   };
   for (const auto& row : rows) {
     SCOPED_TRACE(row.why);
-    EXPECT_EQ(reference::repair_utf8_reference(b(row.in), "?"), row.want);
+    EXPECT_EQ(reference::repair_utf8_reference(bytes_of(row.in), "?"), row.want);
     for (const simd::isa level : simd::supported_isas()) {
       SCOPED_TRACE(simd::isa_name(level));
       // Padded past a block so that the vector kernels judge the row too.
       const std::string pad(70, 'x');
       const std::string in = pad + std::string(row.in) + pad;
-      EXPECT_EQ(repair_utf8(b(in), "?", kMaxResultBytes, kernels(level)).view(),
+      EXPECT_EQ(repair_utf8(bytes_of(in), "?", kMaxResultBytes, kernels(level)).view(),
                 pad + std::string(row.want) + pad);
-      EXPECT_EQ(repair_utf8(b(row.in), "?", kMaxResultBytes, kernels(level)).view(), row.want);
+      EXPECT_EQ(repair_utf8(bytes_of(row.in), "?", kMaxResultBytes, kernels(level)).view(),
+                row.want);
     }
   }
-}
-
-// Model: decode the bits and ask whether the code point is in range, not a
-// surrogate and encoded in its shortest form.
-std::size_t model_length(const std::uint8_t* s, std::size_t n) {
-  const std::uint8_t c = s[0];
-  if (c < 0x80) return 1;
-  std::size_t len = c >= 0xF0 ? 4 : c >= 0xE0 ? 3 : c >= 0xC0 ? 2 : 0;
-  if (len == 0 || c >= 0xF8 || n < len) return 0;
-  std::uint32_t cp = c & (0x7F >> len);
-  for (std::size_t k = 1; k < len; ++k) {
-    if ((s[k] & 0xC0) != 0x80) return 0;
-    cp = (cp << 6) | (s[k] & 0x3F);
-  }
-  const std::uint32_t shortest = cp < 0x80 ? 1 : cp < 0x800 ? 2 : cp < 0x10000 ? 3 : 4;
-  if (shortest != len || cp > 0x10FFFF || (cp >= 0xD800 && cp <= 0xDFFF)) return 0;
-  return len;
 }
 
 TEST(well_formed_length, every_first_and_second_byte_against_model) {
@@ -96,7 +80,8 @@ TEST(well_formed_length, every_first_and_second_byte_against_model) {
       for (std::size_t n = 1; n <= 4; ++n) {
         const std::uint8_t s[4] = {static_cast<std::uint8_t>(first),
                                    static_cast<std::uint8_t>(second), 0x80, 0xBF};
-        ASSERT_EQ(reference::well_formed_length_reference({s, n}), model_length(s, n))
+        ASSERT_EQ(reference::well_formed_length_reference({s, n}),
+                  testing_sweep::utf8_model_length({s, n}))
             << first << " " << second << " " << n;
       }
     }
@@ -116,16 +101,16 @@ TEST(repair_utf8, prefix_skip_matches_reference_on_random_data) {
                                      "\xF4\x90",
                                      "\xE2\x82",
                                      "\xFF",
-                                     std::string_view("\0", 1)};
+                                     "\0"sv};
   for (int round = 0; round < 5000; ++round) {
     std::string in;
     const std::size_t parts = rng() % 24;
     for (std::size_t k = 0; k < parts; ++k) in += pieces[rng() % (k % 3 ? 2 : std::size(pieces))];
     SCOPED_TRACE(round);
     expect_all_levels_match(in, "<?>");
-    const std::size_t prefix = well_formed_prefix(b(in));
+    const std::size_t prefix = well_formed_prefix(bytes_of(in));
     ASSERT_TRUE(prefix == in.size() ||
-                reference::well_formed_length_reference(b(in).subspan(prefix)) == 0);
+                reference::well_formed_length_reference(bytes_of(in).subspan(prefix)) == 0);
   }
 }
 
@@ -169,7 +154,8 @@ TEST(repair_utf8, all_byte_values_and_random_bytes) {
 TEST(repair_utf8, grows_past_its_reserve) {
   const std::string in(10000, '\xFF');
   for (const simd::isa level : simd::supported_isas()) {
-    EXPECT_EQ(repair_utf8(b(in), "\xEF\xBF\xBD", kMaxResultBytes, kernels(level)).size(), 30000u);
+    EXPECT_EQ(repair_utf8(bytes_of(in), "\xEF\xBF\xBD", kMaxResultBytes, kernels(level)).size(),
+              30000u);
   }
 }
 
@@ -198,7 +184,8 @@ TEST(repair_utf8, public_stress_test) {
     const bool well_formed = row.substr(0, tab) == "true";
     for (const simd::isa level : simd::supported_isas()) {
       const std::string padded = std::string(64, 'x') + bytes + std::string(64, 'x');
-      EXPECT_EQ(repair_utf8(b(padded), "", kMaxResultBytes, kernels(level)).size() == padded.size(),
+      EXPECT_EQ(repair_utf8(bytes_of(padded), "", kMaxResultBytes, kernels(level)).size() ==
+                    padded.size(),
                 well_formed);
     }
   }

@@ -18,7 +18,6 @@ using zul_host::tagged;
 using zul_host::utf8;
 
 constexpr std::size_t kMiB = std::size_t{1} << 20;
-const char* decl(int row) { return kDeclarations[row - 1]; }
 
 // A field of /proc/self/status in bytes ("VmRSS", "VmHWM").
 std::size_t status_bytes(const std::string& field) {

@@ -90,24 +90,22 @@ REALmemoryBlock block(std::int64_t size) {
   return m;
 }
 
+template <class Fn>
+GlobalMethodEntry row(Fn* function, const char* declaration) {
+  return {reinterpret_cast<void*>(function), nullptr, declaration, 4, 0, 0, nullptr};
+}
+
 GlobalMethodEntry rows[] = {
-    {reinterpret_cast<void*>(&echo), nullptr, "FakeEchoZUL(s as string) as string", 4, 0, 0,
-     nullptr},
-    {reinterpret_cast<void*>(&leak), nullptr, "FakeLeakZUL(s as string) as integer", 4, 0, 0,
-     nullptr},
-    {reinterpret_cast<void*>(&double_unlock), nullptr,
-     "FakeDoubleUnlockZUL(s as string) as integer", 4, 0, 0, nullptr},
-    {reinterpret_cast<void*>(&keep_record), nullptr, "FakeKeepRecordZUL(s as string) as integer", 4,
-     0, 0, nullptr},
-    {reinterpret_cast<void*>(&raise), nullptr, "FakeRaiseZUL(message as string) as boolean", 4, 0,
-     0, nullptr},
-    {reinterpret_cast<void*>(&sum), nullptr,
-     "FakeSumZUL(a as integer, b as double, c as boolean, p as ptr, m as MemoryBlock) as double", 4,
-     0, 0, nullptr},
-    {reinterpret_cast<void*>(&split), nullptr, "FakeSplitZUL(s as string) as string()", 4, 0, 0,
-     nullptr},
-    {reinterpret_cast<void*>(&block), nullptr, "FakeBlockZUL(size as integer) as memoryblock", 4, 0,
-     0, nullptr},
+    row(&echo, "FakeEchoZUL(s as string) as string"),
+    row(&leak, "FakeLeakZUL(s as string) as integer"),
+    row(&double_unlock, "FakeDoubleUnlockZUL(s as string) as integer"),
+    row(&keep_record, "FakeKeepRecordZUL(s as string) as integer"),
+    row(&raise, "FakeRaiseZUL(message as string) as boolean"),
+    row(&sum,
+        "FakeSumZUL(a as integer, b as double, c as boolean, p as ptr, m as MemoryBlock) as "
+        "double"),
+    row(&split, "FakeSplitZUL(s as string) as string()"),
+    row(&block, "FakeBlockZUL(size as integer) as memoryblock"),
 };
 constexpr std::size_t kRows = sizeof rows / sizeof rows[0];
 

@@ -26,7 +26,7 @@ std::string hex_dump_reference(std::span<const std::uint8_t> input,
   const std::string_view filler = layout.filler.empty() ? std::string_view("0") : layout.filler;
 
   // The digits, then the filler run cut to complete the last line.
-  std::string digits = binary::encode_hex(input);
+  std::string digits(binary::encode_hex(input).view());
   const std::size_t lines = (digits.size() + line_chars - 1) / line_chars;
   const std::size_t pad = lines * line_chars - digits.size();
   digits.reserve(digits.size() + pad);
