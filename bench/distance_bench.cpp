@@ -15,6 +15,7 @@
 #include <vector>
 
 #include "search/distance.h"
+#include "search/jaro_kernels.h"
 #include "tests/reference/char_class_reference.h"
 #include "tests/reference/distance_reference.h"
 #include "tests/reference/utf8_repair_reference.h"
@@ -76,6 +77,27 @@ void BM_jaro_winkler(benchmark::State& state) {
   run_pairs(state, zul::search::jaro_winkler_distance);
 }
 BENCHMARK(BM_jaro_winkler)->Apply(pair_lengths);
+
+// The one-word matcher (b of at most 64 characters) of every level the
+// machine has, scalar first.
+void BM_jaro_winkler_word(benchmark::State& state, zul::simd::isa level) {
+  const auto& kernels = zul::simd::kernels_for(zul::search::detail::jaro_tables(), level);
+  run_pairs(state, [&](const std::vector<std::uint32_t>& a, const std::vector<std::uint32_t>& b) {
+    return zul::search::detail::jaro_winkler_word(a, b, kernels);
+  });
+}
+
+const bool registered = [] {
+  for (const zul::simd::isa level : zul::simd::supported_isas()) {
+    const std::string label = std::string("BM_jaro_winkler_word/") + zul::simd::isa_name(level);
+    benchmark::RegisterBenchmark(label.c_str(), BM_jaro_winkler_word, level)
+        ->Args({8, 0})
+        ->Args({64, 0})
+        ->Args({8, 1})
+        ->Args({64, 1});
+  }
+  return true;
+}();
 
 void BM_jaro_winkler_reference(benchmark::State& state) {
   run_pairs(state, zul::reference::jaro_winkler_distance_reference);

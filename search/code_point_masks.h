@@ -7,7 +7,12 @@
 
 #include <cstddef>
 #include <cstdint>
+#include <cstring>
 #include <span>
+
+#if defined(__SSE2__)
+#include <emmintrin.h>
+#endif
 
 namespace zul::search::detail {
 
@@ -73,5 +78,41 @@ class code_point_masks {
   bool used_[kSlots];
   bool wide_ = false;
 };
+
+#if defined(__SSE2__)
+// Match masks of a pattern of at most 4 * Registers code points, found by
+// comparing c with the whole pattern at once (SSE2, the x86-64 baseline):
+// nothing to build or clear, and wide code points cost no more than bytes.
+// For short patterns, where the table's set-up would cost more than the
+// distance itself.
+template <int Registers>
+class short_pattern_masks {
+ public:
+  static constexpr std::size_t kMax = 4 * Registers;
+
+  explicit short_pattern_masks(std::span<const std::uint32_t> pattern) noexcept
+      : valid_((std::uint32_t{1} << pattern.size()) - 1) {
+    std::uint32_t padded[kMax] = {};
+    std::memcpy(padded, pattern.data(), pattern.size() * sizeof(std::uint32_t));
+    for (int r = 0; r < Registers; ++r) {
+      pattern_[r] = _mm_loadu_si128(reinterpret_cast<const __m128i*>(padded + 4 * r));
+    }
+  }
+
+  std::uint64_t operator()(std::uint32_t c) const noexcept {
+    const __m128i x = _mm_set1_epi32(static_cast<int>(c));
+    std::uint32_t m = 0;
+    for (int r = 0; r < Registers; ++r) {
+      const __m128 eq = _mm_castsi128_ps(_mm_cmpeq_epi32(pattern_[r], x));
+      m |= static_cast<std::uint32_t>(_mm_movemask_ps(eq)) << (4 * r);
+    }
+    return m & valid_;  // padding lanes hold 0, which c may equal
+  }
+
+ private:
+  __m128i pattern_[Registers];
+  std::uint32_t valid_;
+};
+#endif
 
 }  // namespace zul::search::detail

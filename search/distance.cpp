@@ -24,8 +24,9 @@ namespace detail {
 // previous text character, pattern[k-1] the current one, and the diagonal
 // delta at row k of the previous column was 1 (its D0 bit clear). Row 0
 // grows by one per column, so a 1 is shifted into HP at the bottom.
-std::int64_t edit_distance_word(code_points pattern, code_points text) noexcept {
-  const code_point_masks masks(pattern, text);
+namespace {
+template <class Masks>
+std::int64_t edit_distance_with(const Masks& masks, code_points pattern, code_points text) {
   const std::uint64_t last = std::uint64_t{1} << (pattern.size() - 1);
   std::uint64_t vp = ~std::uint64_t{0};  // column 0 grows by one per row
   std::uint64_t vn = 0;
@@ -48,6 +49,24 @@ std::int64_t edit_distance_word(code_points pattern, code_points text) noexcept 
     pm_before = pm;
   }
   return score;
+}
+}  // namespace
+
+std::int64_t edit_distance_word(code_points pattern, code_points text) noexcept {
+#if defined(__SSE2__)
+  // Compares cost more per text character than a table lookup, so they pay
+  // when the table's set-up is not spread over a long text, or when the
+  // pattern has code points that the table would hash.
+  const bool compare = text.size() <= 64 || std::any_of(pattern.begin(), pattern.end(),
+                                                        [](std::uint32_t c) { return c >= 256; });
+  if (compare && pattern.size() <= short_pattern_masks<2>::kMax) {
+    return edit_distance_with(short_pattern_masks<2>(pattern), pattern, text);
+  }
+  if (compare && pattern.size() <= short_pattern_masks<4>::kMax) {
+    return edit_distance_with(short_pattern_masks<4>(pattern), pattern, text);
+  }
+#endif
+  return edit_distance_with(code_point_masks(pattern, text), pattern, text);
 }
 
 // The same update on blocks of 64 rows: bit k of a block's vectors is row

@@ -51,10 +51,13 @@ std::int64_t edit_distance_word(code_points pattern, code_points text) noexcept;
 std::int64_t edit_distance_blocks(code_points pattern, code_points text);
 
 // The two matchers behind jaro_winkler_distance, both texts non-empty: the
-// one-word version for b of at most 64 characters, and the version over
+// one-word version for b of at most 64 characters (with the matching
+// kernels of one instruction-set level), and the version over
 // per-character position lists for any length (0.0 with the byte count when
 // its work memory cannot be allocated).
-distance_result jaro_winkler_word(code_points a, code_points b) noexcept;
+struct jaro_kernels;
+distance_result jaro_winkler_word(code_points a, code_points b,
+                                  const jaro_kernels& kernels) noexcept;
 distance_result jaro_winkler_lists(code_points a, code_points b) noexcept;
 }  // namespace detail
 

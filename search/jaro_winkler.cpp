@@ -9,6 +9,7 @@
 // greedy matches in O(la + lb). A b of up to 64 characters keeps its
 // positions as bit masks in one word instead, with no memory to allocate.
 #include <algorithm>
+#include <atomic>
 #include <bit>
 #include <limits>
 #include <memory>
@@ -16,6 +17,7 @@
 
 #include "search/code_point_masks.h"
 #include "search/distance.h"
+#include "search/jaro_kernels.h"
 
 namespace zul::search {
 namespace {
@@ -178,11 +180,7 @@ distance_result jaro_winkler_lists_as(code_points a, code_points b) noexcept {
 
 namespace detail {
 
-distance_result jaro_winkler_word(code_points a, code_points b) noexcept {
-  const std::size_t lb = b.size();
-  const std::size_t window = match_window(a.size(), lb);
-  // Characters of a beyond lb - 1 + window have no position of b in reach.
-  const code_points reach = a.first(std::min(a.size(), lb + window));
+jaro_counts match_word_scalar(code_points reach, code_points b, std::size_t window) noexcept {
   const code_point_masks masks(b, reach);
   // The window of position i as a mask: bits 0 to window for i = 0; each
   // step shifts it up one, keeping bit 0 while i is within the window of
@@ -201,7 +199,34 @@ distance_result jaro_winkler_word(code_points a, code_points b) noexcept {
   }
   const std::size_t crossed =
       count_crossed(matched_a, matches, b, [&](std::size_t) { return taken; });
-  return {jaro_winkler_from(matches, crossed, a, b), 0};
+  return {matches, crossed};
+}
+
+const simd::family_tables<jaro_kernels>& jaro_tables() noexcept {
+  static constexpr jaro_kernels kScalar{match_word_scalar};
+#if defined(__x86_64__) || defined(_M_X64)
+  static constexpr jaro_kernels kAvx2{match_word_avx2};
+  static constexpr jaro_kernels kAvx512{match_word_avx512};
+  static constexpr simd::family_tables<jaro_kernels> kTables{&kScalar, nullptr, &kAvx2, &kAvx512,
+                                                             nullptr};
+#else
+  static constexpr simd::family_tables<jaro_kernels> kTables{&kScalar};
+#endif
+  return kTables;
+}
+
+const jaro_kernels& active_jaro_kernels() noexcept {
+  static std::atomic<const jaro_kernels*> cache{nullptr};
+  return simd::active(jaro_tables(), cache);
+}
+
+distance_result jaro_winkler_word(code_points a, code_points b,
+                                  const jaro_kernels& kernels) noexcept {
+  const std::size_t window = match_window(a.size(), b.size());
+  // Characters of a beyond lb - 1 + window have no position of b in reach.
+  const code_points reach = a.first(std::min(a.size(), b.size() + window));
+  const jaro_counts counts = kernels.match_word(reach, b, window);
+  return {jaro_winkler_from(counts.matches, counts.crossed, a, b), 0};
 }
 
 distance_result jaro_winkler_lists(code_points a, code_points b) noexcept {
@@ -215,7 +240,7 @@ distance_result jaro_winkler_lists(code_points a, code_points b) noexcept {
 distance_result jaro_winkler_distance(code_points a, code_points b) noexcept {
   if (a.empty()) return {b.empty() ? 0.0 : 1.0, 0};
   if (b.empty()) return {1.0, 0};
-  if (b.size() <= 64) return detail::jaro_winkler_word(a, b);
+  if (b.size() <= 64) return detail::jaro_winkler_word(a, b, detail::active_jaro_kernels());
   return detail::jaro_winkler_lists(a, b);
 }
 
