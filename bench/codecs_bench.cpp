@@ -13,12 +13,24 @@
 #include <string>
 #include <vector>
 
+#include "binary/hex_dump.h"
 #include "binary/readable_runs.h"
 #include "common/bytes.h"
 #include "common/cpu.h"
 #include "common/scan.h"
+#include "encodings/html.h"
 #include "encodings/html_tags.h"
+#include "encodings/mail_subject.h"
+#include "encodings/quoted_printable.h"
+#include "encodings/sql.h"
 #include "encodings/url.h"
+#include "encodings/xml.h"
+#include "tests/reference/hex_dump_reference.h"
+#include "tests/reference/html_reference.h"
+#include "tests/reference/mail_subject_reference.h"
+#include "tests/reference/quoted_printable_reference.h"
+#include "tests/reference/sql_reference.h"
+#include "tests/reference/xml_reference.h"
 #include "text/latin1.h"
 #include "text/utf8_repair.h"
 
@@ -198,13 +210,14 @@ std::string codec_input_of(codec_input kind, std::size_t size, std::string_view 
   return s;
 }
 
-using byte_codec = zul::out_buffer (*)(std::string_view, const zul::scan_kernels&);
+// Each codec keeps its result from the optimizer itself (results differ in
+// type).
+using byte_codec = void (*)(std::string_view, zul::simd::isa);
 
 void BM_codec(benchmark::State& state, byte_codec codec, codec_input kind, std::string specials,
               zul::simd::isa level) {
   const std::string in = codec_input_of(kind, static_cast<std::size_t>(state.range(0)), specials);
-  const zul::scan_kernels& scan = zul::scan_for(level);
-  for (auto _ : state) benchmark::DoNotOptimize(codec(in, scan));
+  for (auto _ : state) codec(in, level);
   state.SetBytesProcessed(static_cast<std::int64_t>(state.iterations()) * state.range(0));
 }
 
@@ -222,28 +235,150 @@ void BM_readable_runs(benchmark::State& state, codec_input kind, zul::simd::isa 
   state.SetBytesProcessed(static_cast<std::int64_t>(state.iterations()) * state.range(0));
 }
 
+// The code-point codecs (HTML, XML) read UTF-32 lanes, as the host hands
+// them text: the same inputs with each byte as one code point (so "\xE9" is
+// U+00E9), size / 4 of them, so that the bytes read equal memcpy's.
+using code_point_codec = void (*)(zul::encodings::code_point_view, const zul::scan_kernels&);
+
+void BM_code_point_codec(benchmark::State& state, code_point_codec codec, codec_input kind,
+                         std::string specials, zul::simd::isa level) {
+  const std::string bytes =
+      codec_input_of(kind, static_cast<std::size_t>(state.range(0)) / 4, specials);
+  const zul::encodings::code_points lanes = [&] {
+    zul::encodings::code_points v;
+    for (const char c : bytes) v.push_back(static_cast<std::uint8_t>(c));
+    return v;
+  }();
+  const zul::scan_kernels& scan = zul::scan_for(level);
+  for (auto _ : state) codec(lanes, scan);
+  state.SetBytesProcessed(static_cast<std::int64_t>(state.iterations()) * state.range(0));
+}
+
+// reference: today's one-at-a-time version, run once (it takes no kernels).
+struct code_point_codec_row {
+  const char* name;
+  code_point_codec codec;
+  const char* specials;
+  bool reference = false;
+};
+const code_point_codec_row kCodePointCodecs[] = {
+    {"encode_html",
+     [](zul::encodings::code_point_view in, const zul::scan_kernels& k) {
+       benchmark::DoNotOptimize(zul::encodings::encode_html(in, 0, zul::kMaxResultBytes, k));
+     },
+     "<&\xE9>"},
+    {"encode_xml",
+     [](zul::encodings::code_point_view in, const zul::scan_kernels& k) {
+       benchmark::DoNotOptimize(
+           zul::encodings::encode_xml(in, 0, zul::encodings::kMaxResultCodePoints, k));
+     },
+     "<&\">"},
+    {"decode_html",
+     [](zul::encodings::code_point_view in, const zul::scan_kernels& k) {
+       benchmark::DoNotOptimize(
+           zul::encodings::decode_html(in, zul::encodings::kMaxResultCodePoints, k));
+     },
+     "&"},
+    {"encode_html_reference",
+     [](zul::encodings::code_point_view in, const zul::scan_kernels&) {
+       benchmark::DoNotOptimize(zul::reference::encode_html_reference(in, 0));
+     },
+     "<&\xE9>", true},
+    {"encode_xml_reference",
+     [](zul::encodings::code_point_view in, const zul::scan_kernels&) {
+       benchmark::DoNotOptimize(zul::reference::encode_xml_reference(in, 0));
+     },
+     "<&\">", true},
+    {"decode_html_reference",
+     [](zul::encodings::code_point_view in, const zul::scan_kernels&) {
+       benchmark::DoNotOptimize(zul::reference::decode_html_reference(in));
+     },
+     "&", true},
+};
+
+// The usual dump: 16 one-byte groups a line, spaced, one line end.
+const zul::binary::hex_dump_layout kDumpLayout{2, 16, "", "\n", " ", ""};
+
 // Each codec with the bytes that make it work; "scalar" is the plain scan.
 struct codec_row {
   const char* name;
   byte_codec codec;
   const char* specials;
+  bool reference = false;
 };
 const codec_row kCodecs[] = {
     {"encode_url",
-     [](std::string_view in, const zul::scan_kernels& k) {
-       return zul::encodings::encode_url(in, 1, zul::kMaxResultBytes, k);
+     [](std::string_view in, zul::simd::isa k) {
+       benchmark::DoNotOptimize(
+           zul::encodings::encode_url(in, 1, zul::kMaxResultBytes, zul::scan_for(k)));
      },
      " &/="},
     {"decode_url",
-     [](std::string_view in, const zul::scan_kernels& k) {
-       return zul::encodings::decode_url(in, 1, k);
+     [](std::string_view in, zul::simd::isa k) {
+       benchmark::DoNotOptimize(zul::encodings::decode_url(in, 1, zul::scan_for(k)));
      },
      "+"},
     {"remove_html_tags",
-     [](std::string_view in, const zul::scan_kernels& k) {
-       return zul::encodings::remove_html_tags(in, "", zul::kMaxResultBytes, k);
+     [](std::string_view in, zul::simd::isa k) {
+       benchmark::DoNotOptimize(
+           zul::encodings::remove_html_tags(in, "", zul::kMaxResultBytes, zul::scan_for(k)));
      },
      "<>"},
+    {"encode_quoted_printable",
+     [](std::string_view in, zul::simd::isa k) {
+       benchmark::DoNotOptimize(
+           zul::encodings::encode_quoted_printable(in, 76, zul::kMaxResultBytes, zul::scan_for(k)));
+     },
+     "=\n\xE9"},
+    {"decode_quoted_printable",
+     [](std::string_view in, zul::simd::isa k) {
+       benchmark::DoNotOptimize(zul::encodings::decode_quoted_printable(in, zul::scan_for(k)));
+     },
+     "=\n"},
+    {"replace_sql_booleans",
+     [](std::string_view in, zul::simd::isa k) {
+       benchmark::DoNotOptimize(
+           zul::encodings::replace_sql_booleans(in, zul::encodings::detail::sql_kernels_for(k)));
+     },
+     " true 'x' "},
+    {"replace_sql_booleans_reference",
+     [](std::string_view in, zul::simd::isa) {
+       benchmark::DoNotOptimize(zul::reference::replace_sql_booleans_reference(in));
+     },
+     " true 'x' ", true},
+    {"encode_mail_subject",
+     [](std::string_view in, zul::simd::isa k) {
+       benchmark::DoNotOptimize(
+           zul::encodings::encode_mail_subject(in, zul::kMaxResultBytes, zul::scan_for(k)));
+     },
+     " ?\xC3"},
+    {"encode_mail_subject_reference",
+     [](std::string_view in, zul::simd::isa) {
+       benchmark::DoNotOptimize(zul::reference::encode_mail_subject_reference(in));
+     },
+     " ?\xC3", true},
+    {"hex_dump",
+     [](std::string_view in, zul::simd::isa k) {
+       benchmark::DoNotOptimize(
+           zul::binary::hex_dump(zul::bytes_of(in), kDumpLayout,
+                                 zul::simd::kernels_for(zul::binary::detail::hex_tables(), k)));
+     },
+     "\xFF"},
+    {"hex_dump_reference",
+     [](std::string_view in, zul::simd::isa) {
+       benchmark::DoNotOptimize(zul::reference::hex_dump_reference(zul::bytes_of(in), kDumpLayout));
+     },
+     "\xFF", true},
+    {"encode_quoted_printable_reference",
+     [](std::string_view in, zul::simd::isa) {
+       benchmark::DoNotOptimize(zul::reference::encode_quoted_printable_reference(in, 76));
+     },
+     "=\n\xE9", true},
+    {"decode_quoted_printable_reference",
+     [](std::string_view in, zul::simd::isa) {
+       benchmark::DoNotOptimize(zul::reference::decode_quoted_printable_reference(in));
+     },
+     "=\n", true},
 };
 
 const bool registered = [] {
@@ -283,9 +418,22 @@ const bool registered = [] {
   for (const codec_row& row : kCodecs) {
     for (const auto& [kind, name] : codec_inputs) {
       for (const zul::simd::isa level : zul::simd::supported_isas()) {
+        if (row.reference && level != zul::simd::isa::scalar) continue;
         const std::string label =
             std::string("BM_") + row.name + "/" + name + "/" + zul::simd::isa_name(level);
         benchmark::RegisterBenchmark(label.c_str(), BM_codec, row.codec, kind,
+                                     std::string(row.specials), level)
+            ->Apply(sizes);
+      }
+    }
+  }
+  for (const code_point_codec_row& row : kCodePointCodecs) {
+    for (const auto& [kind, name] : codec_inputs) {
+      for (const zul::simd::isa level : zul::simd::supported_isas()) {
+        if (row.reference && level != zul::simd::isa::scalar) continue;
+        const std::string label =
+            std::string("BM_") + row.name + "/" + name + "/" + zul::simd::isa_name(level);
+        benchmark::RegisterBenchmark(label.c_str(), BM_code_point_codec, row.codec, kind,
                                      std::string(row.specials), level)
             ->Apply(sizes);
       }

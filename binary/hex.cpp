@@ -57,6 +57,18 @@ void encode_hex_scalar(const std::uint8_t* in, std::size_t n, char* out) noexcep
   for (; i < n; ++i, out += 2) std::memcpy(out, kDigitPairs[in[i]].data(), 2);
 }
 
+// One 4-byte store a byte: its digit pair and the spacer; the next store
+// starts on the fourth byte.
+void spaced_pairs_scalar(const std::uint8_t* in, std::size_t n, char spacer, char* out) noexcept {
+  const std::uint32_t space = static_cast<std::uint32_t>(static_cast<std::uint8_t>(spacer)) << 16;
+  for (std::size_t k = 0; k < n; ++k, out += 3) {
+    std::uint16_t pair;
+    std::memcpy(&pair, kDigitPairs[in[k]].data(), 2);
+    const std::uint32_t three = pair | space;
+    std::memcpy(out, &three, 4);
+  }
+}
+
 void decode_hex_scalar(const char* in, std::size_t n, std::uint8_t* out) noexcept {
   for (std::size_t k = 0; k < n; ++k, in += 2) {
     out[k] = static_cast<std::uint8_t>(hex_value(in[0]) << 4 | hex_value(in[1]));
@@ -64,11 +76,11 @@ void decode_hex_scalar(const char* in, std::size_t n, std::uint8_t* out) noexcep
 }
 
 namespace {
-constexpr hex_kernels kScalar{encode_hex_scalar, decode_hex_scalar};
+constexpr hex_kernels kScalar{encode_hex_scalar, decode_hex_scalar, spaced_pairs_scalar};
 #if defined(__x86_64__) || defined(_M_X64)
-constexpr hex_kernels kSse2{encode_hex_sse2, decode_hex_sse2};
-constexpr hex_kernels kAvx2{encode_hex_avx2, decode_hex_avx2};
-constexpr hex_kernels kAvx512{encode_hex_avx512, decode_hex_avx512};
+constexpr hex_kernels kSse2{encode_hex_sse2, decode_hex_sse2, spaced_pairs_scalar};
+constexpr hex_kernels kAvx2{encode_hex_avx2, decode_hex_avx2, spaced_pairs_avx2};
+constexpr hex_kernels kAvx512{encode_hex_avx512, decode_hex_avx512, spaced_pairs_avx2};
 constexpr simd::family_tables<hex_kernels> kTables{&kScalar, &kSse2, &kAvx2, &kAvx512, nullptr};
 #else
 constexpr simd::family_tables<hex_kernels> kTables{&kScalar};

@@ -11,6 +11,9 @@
 #include <string>
 #include <string_view>
 
+#include "binary/hex_kernels.h"
+#include "common/cpu.h"
+#include "common/out_buffer.h"
 #include "common/size_gate.h"
 
 namespace zul::binary {
@@ -30,7 +33,10 @@ inline constexpr std::uint64_t kMaxDumpLength = kMaxResultBytes;
 // The dump of input: ceil(2n / (linelen * hexlen)) lines. Empty input, a
 // hexlen or linelen below 1, or a dump longer than kMaxDumpLength give ""
 // without allocating anything of that size (sizes are checked for overflow).
-std::string hex_dump(std::span<const std::uint8_t> input, const hex_dump_layout& layout);
+// kernels: the hex encoder to use (tests pass every level's).
+out_buffer hex_dump(std::span<const std::uint8_t> input, const hex_dump_layout& layout,
+                    const detail::hex_kernels& kernels = simd::kernels_for(detail::hex_tables(),
+                                                                           simd::best_isa()));
 
 namespace detail {
 

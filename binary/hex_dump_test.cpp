@@ -7,8 +7,10 @@
 
 #include <string>
 #include <string_view>
+#include <vector>
 
 #include "common/bytes.h"
+#include "tests/reference/hex_dump_reference.h"
 
 namespace zul::binary {
 namespace {
@@ -81,6 +83,32 @@ TEST(hex_dump, oversize_gives_empty) {
     EXPECT_EQ(detail::hex_dump_length(row.n, row.layout), want);
   }
   EXPECT_EQ(hex_dump(bytes_of("x"), {1 << 20, 1 << 20, "", "", "", ""}), "");
+}
+
+// Every hex kernel against the reference, on layouts that take the
+// one-byte-group path and the batched one (odd line widths split bytes;
+// texts longer than a 16-byte copy), at lengths around the batch size.
+TEST(hex_dump, every_kernel_matches_the_reference) {
+  std::vector<std::uint8_t> in(40000);
+  for (std::size_t k = 0; k < in.size(); ++k) in[k] = static_cast<std::uint8_t>(k * 37 + k / 256);
+  const std::string long_text(20, '-');
+  const hex_dump_layout layouts[] = {
+      {2, 16, "", "\n", " ", ""},   {2, 1, "", "\r\n", " ", ""},
+      {2, 3, "> ", "\n", ":", "."}, {3, 5, "[", "]\n", ", ", "ab"},
+      {1, 7, "", "\n", "", "xyz"},  {4, 9, long_text, long_text, long_text, ""},
+      {17, 2, "", "\n", " ", "#"},  {2, 8193, "", "\n", "  ", ""},
+  };
+  for (const simd::isa level : simd::supported_isas()) {
+    SCOPED_TRACE(simd::isa_name(level));
+    const auto& kernels = simd::kernels_for(detail::hex_tables(), level);
+    for (const hex_dump_layout& layout : layouts) {
+      for (const std::size_t n : {1u, 2u, 15u, 16u, 17u, 33u, 1000u, 8191u, 8192u, 8193u, 40000u}) {
+        const std::span<const std::uint8_t> part(in.data(), n);
+        ASSERT_EQ(hex_dump(part, layout, kernels), zul::reference::hex_dump_reference(part, layout))
+            << "hexlen " << layout.hexlen << " linelen " << layout.linelen << " n " << n;
+      }
+    }
+  }
 }
 
 }  // namespace

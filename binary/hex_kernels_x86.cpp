@@ -9,6 +9,11 @@
 // l = (c | 0x20) - 'a' a letter value when l <= 5; anything else counts 0.
 // A multiply-add of each pair with (16, 1) gives 16 * high + low in a 16-bit
 // lane, narrowed to one byte.
+//
+// Spaced pairs (dumps of one-byte groups): 16 bytes give 32 digits in two
+// vectors a (bytes 0-7) and b (bytes 8-15); three byte shuffles put them at
+// their places in the 48 output characters (digits 2g, 2g + 1 of group g at
+// 3g, 3g + 1) with zeros at every 3g + 2, which an OR fills with the spacer.
 #include "binary/hex_kernels.h"
 
 #if defined(__x86_64__) || defined(_M_X64)
@@ -116,6 +121,39 @@ ZUL_AVX512 void decode_hex_avx512(const char* in, std::size_t n, std::uint8_t* o
     _mm512_storeu_si512(out + k, bytes);
   }
   decode_hex_scalar(in + 2 * k, n - k, out + k);
+}
+
+ZUL_AVX2 void spaced_pairs_avx2(const std::uint8_t* in, std::size_t n, char spacer,
+                                char* out) noexcept {
+  const __m128i digits =
+      _mm_setr_epi8('0', '1', '2', '3', '4', '5', '6', '7', '8', '9', 'A', 'B', 'C', 'D', 'E', 'F');
+  const __m128i nibble = _mm_set1_epi8(0x0F);
+  constexpr char X = -128;  // shuffles to zero
+  const char s = spacer;
+  const __m128i index0 = _mm_setr_epi8(0, 1, X, 2, 3, X, 4, 5, X, 6, 7, X, 8, 9, X, 10);
+  const __m128i index1a = _mm_setr_epi8(11, X, 12, 13, X, 14, 15, X, X, X, X, X, X, X, X, X);
+  const __m128i index1b = _mm_setr_epi8(X, X, X, X, X, X, X, X, 0, 1, X, 2, 3, X, 4, 5);
+  const __m128i index2 = _mm_setr_epi8(X, 6, 7, X, 8, 9, X, 10, 11, X, 12, 13, X, 14, 15, X);
+  const __m128i space0 = _mm_setr_epi8(0, 0, s, 0, 0, s, 0, 0, s, 0, 0, s, 0, 0, s, 0);
+  const __m128i space1 = _mm_setr_epi8(0, s, 0, 0, s, 0, 0, s, 0, 0, s, 0, 0, s, 0, 0);
+  const __m128i space2 = _mm_setr_epi8(s, 0, 0, s, 0, 0, s, 0, 0, s, 0, 0, s, 0, 0, s);
+  std::size_t i = 0;
+  for (; n - i >= 16; i += 16, out += 48) {
+    const __m128i v = _mm_loadu_si128(reinterpret_cast<const __m128i*>(in + i));
+    const __m128i high = _mm_shuffle_epi8(digits, _mm_and_si128(_mm_srli_epi16(v, 4), nibble));
+    const __m128i low = _mm_shuffle_epi8(digits, _mm_and_si128(v, nibble));
+    const __m128i a = _mm_unpacklo_epi8(high, low);
+    const __m128i b = _mm_unpackhi_epi8(high, low);
+    _mm_storeu_si128(reinterpret_cast<__m128i*>(out),
+                     _mm_or_si128(_mm_shuffle_epi8(a, index0), space0));
+    _mm_storeu_si128(
+        reinterpret_cast<__m128i*>(out + 16),
+        _mm_or_si128(_mm_or_si128(_mm_shuffle_epi8(a, index1a), _mm_shuffle_epi8(b, index1b)),
+                     space1));
+    _mm_storeu_si128(reinterpret_cast<__m128i*>(out + 32),
+                     _mm_or_si128(_mm_shuffle_epi8(b, index2), space2));
+  }
+  spaced_pairs_scalar(in + i, n - i, spacer, out);
 }
 
 }  // namespace zul::binary::detail

@@ -107,11 +107,26 @@ inline std::size_t find_first_in_set(const byte_set& set, bytes_view bytes) noex
   return find_first_in_set(set, bytes.data(), bytes.size());
 }
 
+// Code-point lanes (UTF-32 text) against a byte set: lane c is a member when
+// the set holds min(c, 255). One set thus says which characters below U+0080
+// need work and, through 255 (with 128..254 alike), whether all characters
+// from U+0080 up do. Index of the first member lane of [p, p + n), or n.
+std::size_t find_first_code_point_in_set(const byte_set& set, const std::uint32_t* p,
+                                         std::size_t n) noexcept;
+
 namespace detail {
 
 // One kernel per level; tests and benchmarks run each of them.
 struct byte_set_kernels {
   std::size_t (*find_first)(const byte_set& set, const std::uint8_t* p, std::size_t n) noexcept;
+  // find_first_code_point_in_set for one level.
+  std::size_t (*find_first_code_point)(const byte_set& set, const std::uint32_t* p,
+                                       std::size_t n) noexcept;
+  // The same search that also narrows: lanes [0, k) before the first member
+  // k are written to out as the bytes min(c, 255). out must have room for
+  // n + 64 bytes; bytes past out[k - 1] are left unspecified.
+  std::size_t (*narrow_until_member)(const byte_set& set, const std::uint32_t* p, std::size_t n,
+                                     std::uint8_t* out) noexcept;
 };
 const family_tables<byte_set_kernels>& byte_set_tables() noexcept;
 
@@ -128,6 +143,18 @@ std::size_t find_first_in_set_avx512(const byte_set& set, const std::uint8_t* p,
                                      std::size_t n) noexcept;
 std::size_t find_first_in_set_neon(const byte_set& set, const std::uint8_t* p,
                                    std::size_t n) noexcept;
+std::size_t find_first_code_point_scalar(const byte_set& set, const std::uint32_t* p,
+                                         std::size_t n) noexcept;
+std::size_t find_first_code_point_avx2(const byte_set& set, const std::uint32_t* p,
+                                       std::size_t n) noexcept;
+std::size_t find_first_code_point_avx512(const byte_set& set, const std::uint32_t* p,
+                                         std::size_t n) noexcept;
+std::size_t narrow_until_member_scalar(const byte_set& set, const std::uint32_t* p, std::size_t n,
+                                       std::uint8_t* out) noexcept;
+std::size_t narrow_until_member_avx2(const byte_set& set, const std::uint32_t* p, std::size_t n,
+                                     std::uint8_t* out) noexcept;
+std::size_t narrow_until_member_avx512(const byte_set& set, const std::uint32_t* p, std::size_t n,
+                                       std::uint8_t* out) noexcept;
 
 }  // namespace detail
 }  // namespace zul::simd

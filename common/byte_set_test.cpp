@@ -147,5 +147,47 @@ TEST(find_first_in_set, empty_range_and_null_pointer) {
       [&](const detail::byte_set_kernels& k) { EXPECT_EQ(k.find_first(set, nullptr, 0), 0u); });
 }
 
+// Code-point lanes: every byte value and the saturating values above it, at
+// every position of every length up to two AVX-512 blocks past a whole one,
+// through both code-point kernels; the narrowed bytes before the hit too.
+TEST(find_first_code_point, lanes_saturate_at_255_on_every_kernel) {
+  const std::vector<std::uint32_t> values = [] {
+    std::vector<std::uint32_t> v;
+    for (std::uint32_t c = 0; c < 256; ++c) v.push_back(c);
+    for (std::uint32_t c : {0x100u, 0x7FFFu, 0x8000u, 0xFFFFu, 0x10000u, 0x10FFFFu, 0x7FFFFFFFu,
+                            0x80000000u, 0xFFFFFFFFu})
+      v.push_back(c);
+    return v;
+  }();
+  byte_set markup = make_byte_set(bytes_of("&<>\"'\x01"));
+  byte_set high = markup;
+  high.add_range(0x80, 0xFF);
+  for_each_kernel([&](const detail::byte_set_kernels& k) {
+    for (const byte_set* set : {&markup, &high}) {
+      for (std::size_t n = 0; n <= 144; ++n) {
+        std::vector<std::uint32_t> lanes(n + 1, 'a');
+        lanes[n] = '&';  // a member just past the end must not be found
+        std::vector<std::uint8_t> out(n + 64);
+        for (std::size_t hit = 0; hit <= n; hit += (n > 72 ? 5 : 1)) {
+          for (std::size_t v = 0; v < values.size(); v += (hit == n / 2 ? 1 : 37)) {
+            if (hit < n) lanes[hit] = values[v];
+            const std::uint32_t c = hit < n ? values[v] : 0;
+            const bool member =
+                hit < n && set->contains(static_cast<std::uint8_t>(std::min(c, 255u)));
+            const std::size_t want = member ? hit : n;
+            ASSERT_EQ(k.find_first_code_point(*set, lanes.data(), n), want)
+                << "n " << n << " hit " << hit << " value " << c;
+            ASSERT_EQ(k.narrow_until_member(*set, lanes.data(), n, out.data()), want);
+            for (std::size_t i = 0; i < want; ++i) {
+              ASSERT_EQ(out[i], std::min<std::uint32_t>(lanes[i], 255)) << "n " << n << " i " << i;
+            }
+          }
+          if (hit < n) lanes[hit] = 'a';
+        }
+      }
+    }
+  });
+}
+
 }  // namespace
 }  // namespace zul::simd

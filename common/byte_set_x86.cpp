@@ -11,6 +11,12 @@
 // Blocks run two vectors at a time; the end is one overlapping vector (no
 // earlier byte matched, so re-reading them is harmless) or, for AVX-512, a
 // masked load that never touches bytes past the end.
+//
+// Code-point lanes are first narrowed to bytes with unsigned saturation
+// (min(c, 255)), then take the same membership test: AVX2 clamps with
+// vpminud and packs twice (vpackusdw, vpackuswb, which interleave the 128-bit
+// halves; one vpermd puts the dwords back in order), AVX-512 narrows 16 lanes
+// at a time with vpmovusdb.
 #include "common/byte_set.h"
 
 #if defined(__x86_64__) || defined(_M_X64)
@@ -165,6 +171,91 @@ ZUL_AVX512 std::size_t find_first_in_set_avx512(const byte_set& set, const std::
     if (m != 0) return i + __builtin_ctzll(m);
   }
   return n;
+}
+
+namespace {
+
+// 8 code-point lanes clamped to 255.
+ZUL_AVX2 inline __m256i clamped256(const std::uint32_t* p) {
+  return _mm256_min_epu32(_mm256_loadu_si256(reinterpret_cast<const __m256i*>(p)),
+                          _mm256_set1_epi32(255));
+}
+
+// 32 code-point lanes as the bytes min(c, 255), in order.
+ZUL_AVX2 inline __m256i narrow256(const std::uint32_t* p) {
+  const __m256i ab = _mm256_packus_epi32(clamped256(p), clamped256(p + 8));
+  const __m256i cd = _mm256_packus_epi32(clamped256(p + 16), clamped256(p + 24));
+  return _mm256_permutevar8x32_epi32(_mm256_packus_epi16(ab, cd),
+                                     _mm256_setr_epi32(0, 4, 1, 5, 2, 6, 3, 7));
+}
+
+template <bool kNarrow>
+ZUL_AVX2 std::size_t code_points_avx2(const byte_set& set, const std::uint32_t* p, std::size_t n,
+                                      std::uint8_t* out) noexcept {
+  const tables256 t = load_tables256(set);
+  std::size_t i = 0;
+  for (; n - i >= 32; i += 32) {
+    const __m256i v = narrow256(p + i);
+    if (kNarrow) _mm256_storeu_si256(reinterpret_cast<__m256i*>(out + i), v);
+    if (const auto m = static_cast<std::uint32_t>(_mm256_movemask_epi8(members256(t, v)))) {
+      return i + static_cast<std::size_t>(__builtin_ctz(m));
+    }
+  }
+  return i + (kNarrow ? narrow_until_member_scalar(set, p + i, n - i, out + i)
+                      : find_first_code_point_scalar(set, p + i, n - i));
+}
+
+// 16 lanes (those of live; the others read as 0) as bytes min(c, 255). The
+// zero-masked form, as in broadcast512: GCC 12 flags the plain one's
+// undefined source.
+ZUL_AVX512 inline __m128i narrow128(const std::uint32_t* p, __mmask16 live) {
+  return _mm512_maskz_cvtusepi32_epi8(static_cast<__mmask16>(0xFFFF),
+                                      _mm512_maskz_loadu_epi32(live, p));
+}
+
+template <bool kNarrow>
+ZUL_AVX512 std::size_t code_points_avx512(const byte_set& set, const std::uint32_t* p,
+                                          std::size_t n, std::uint8_t* out) noexcept {
+  const tables512 t = load_tables512(set);
+  const __mmask16 all = 0xFFFF;
+  std::size_t i = 0;
+  for (; n - i >= 64; i += 64) {
+    __m512i v = _mm512_zextsi128_si512(narrow128(p + i, all));
+    v = _mm512_inserti32x4(v, narrow128(p + i + 16, all), 1);
+    v = _mm512_inserti32x4(v, narrow128(p + i + 32, all), 2);
+    v = _mm512_inserti32x4(v, narrow128(p + i + 48, all), 3);
+    if (kNarrow) _mm512_storeu_si512(out + i, v);
+    if (const __mmask64 m = members512(t, v)) return i + __builtin_ctzll(m);
+  }
+  for (; i < n; i += 16) {
+    const std::size_t left = n - i;
+    const auto live = static_cast<__mmask16>(left >= 16 ? 0xFFFF : (1u << left) - 1);
+    const __m128i q = narrow128(p + i, live);
+    if (kNarrow) _mm_storeu_si128(reinterpret_cast<__m128i*>(out + i), q);
+    if (const __mmask64 m = members512(t, _mm512_zextsi128_si512(q)) & live) {
+      return i + __builtin_ctzll(m);
+    }
+  }
+  return n;
+}
+
+}  // namespace
+
+std::size_t find_first_code_point_avx2(const byte_set& set, const std::uint32_t* p,
+                                       std::size_t n) noexcept {
+  return code_points_avx2<false>(set, p, n, nullptr);
+}
+std::size_t narrow_until_member_avx2(const byte_set& set, const std::uint32_t* p, std::size_t n,
+                                     std::uint8_t* out) noexcept {
+  return code_points_avx2<true>(set, p, n, out);
+}
+std::size_t find_first_code_point_avx512(const byte_set& set, const std::uint32_t* p,
+                                         std::size_t n) noexcept {
+  return code_points_avx512<false>(set, p, n, nullptr);
+}
+std::size_t narrow_until_member_avx512(const byte_set& set, const std::uint32_t* p, std::size_t n,
+                                       std::uint8_t* out) noexcept {
+  return code_points_avx512<true>(set, p, n, out);
 }
 
 }  // namespace zul::simd::detail

@@ -1,14 +1,16 @@
-// HTML reference encoder and decoder over code points. Both reserve their
-// output once for the worst case (13 bytes per character; one code point per
-// character), capped at their result limit, and make one pass. The encoder
-// decides every ASCII character from a 128-entry table per mode and looks
-// characters from U+0080 up in the entity index; the decoder copies runs
-// without "&" whole. Row-by-row references live with the tests
-// (tests/reference/).
+// HTML reference encoder and decoder over code points, one pass each. A
+// code-point search (byte-set kernels over UTF-32 lanes) finds the next
+// character that needs work; the encoder narrows the ASCII run before it to
+// bytes in the same pass, the decoder copies the run before the next "&"
+// whole. Only those characters take the rules one by one: ASCII from a
+// 128-entry table per mode, U+0080 up through the entity index. Row-by-row
+// references live with the tests (tests/reference/).
 #include "encodings/html.h"
 
 #include <array>
 #include <charconv>
+#include <cstring>
+#include <optional>
 #include <string_view>
 
 #include "common/markup.h"
@@ -19,30 +21,24 @@ namespace zul::encodings {
 namespace {
 
 // The longest text one character becomes: "&#4294967295;".
-constexpr std::uint64_t kMaxReferenceBytes = 13;
+constexpr std::size_t kMaxReferenceBytes = 13;
 
-// Each append writes nothing and says false when the output would pass
-// limit bytes.
-bool append_text(std::string& out, std::string_view text, std::uint64_t limit) {
-  if (!make_room(out, text.size(), limit)) return false;
-  out += text;
-  return true;
-}
+// Characters the encoder changes in each mode: dropped controls, U+0080 and
+// up (255 stands for them all in a code-point search) and, when escaping,
+// the five markup characters.
+constexpr simd::byte_set kEncodeWork = byte_set_where(
+    [](std::uint8_t b) { return b >= 128 || is_dropped_control(b) || is_markup(b); });
+constexpr simd::byte_set kEncodeWorkKeepMarkup =
+    byte_set_where([](std::uint8_t b) { return b >= 128 || is_dropped_control(b); });
+constexpr simd::byte_set kNeedsEscaping =
+    byte_set_where([](std::uint8_t b) { return b >= 128 || is_markup(b); });
+constexpr simd::byte_set kAmpersand = byte_set_where([](std::uint8_t b) { return b == '&'; });
 
-bool append_numeric_reference(std::string& out, std::uint32_t cp, std::uint64_t limit) {
-  char text[16] = {'&', '#'};
-  char* end = std::to_chars(text + 2, text + sizeof text - 1, cp).ptr;
-  *end++ = ';';
-  return append_text(out, {text, static_cast<std::size_t>(end - text)}, limit);
-}
-
-bool append_named_reference(std::string& out, std::string_view name, std::uint64_t limit) {
-  if (!make_room(out, name.size() + 2, limit)) return false;
-  out += '&';
-  out += name;
-  out += ';';
-  return true;
-}
+// Characters taken one by one after one that needs work: a few, doubling
+// while searches keep finding short runs (text dense with references), back
+// to a few after a long run. Runs are narrowed kChunk characters at a time so
+// that each request for room stays small.
+constexpr std::size_t kAfterMin = 8, kAfterMax = 512, kShortRun = 16, kChunk = 4096;
 
 // What the encoder writes for each ASCII character in one mode; an empty
 // text drops the character.
@@ -110,22 +106,46 @@ std::optional<std::uint32_t> reference_value(code_point_view name) {
   return static_cast<std::uint32_t>(value);
 }
 
+// Writes the text of character c at o and returns the end.
+std::uint8_t* write_character(std::uint8_t* o, std::uint32_t c, const ascii_actions& actions) {
+  if (c < 128) {
+    const std::string_view text = actions[c];
+    if (text.empty()) return o;  // a dropped control
+    std::memcpy(o, text.data(), text.size());
+    return o + text.size();
+  }
+  *o++ = '&';
+  if (const std::string_view name = entity_name(c, true); !name.empty()) {
+    std::memcpy(o, name.data(), name.size());
+    o += name.size();
+  } else {
+    *o++ = '#';
+    char* digits = reinterpret_cast<char*>(o);
+    o = reinterpret_cast<std::uint8_t*>(std::to_chars(digits, digits + 10, c).ptr);
+  }
+  *o++ = ';';
+  return o;
+}
+
 }  // namespace
 
-code_points decode_html(code_point_view text, std::uint64_t limit) {
+code_points decode_html(code_point_view text, std::uint64_t limit, const scan_kernels& scan) {
   text = skip_byte_order_mark(text);
   const std::size_t n = text.size();
   code_points out;
   out.reserve(worst_case_reserve(n, 1, 0, limit));
   std::size_t i = 0;
   while (i < n) {
-    std::size_t run = i;
-    while (run < n && text[run] != '&') ++run;
-    if (!make_room(out, run - i, limit)) return {};
-    out.insert(out.end(), text.begin() + static_cast<std::ptrdiff_t>(i),
-               text.begin() + static_cast<std::ptrdiff_t>(run));
-    i = run;
-    if (i == n) break;
+    // References back to back need no search.
+    const std::size_t run =
+        text[i] == '&' ? i : i + scan.find_first_code_point(kAmpersand, text.data() + i, n - i);
+    if (run != i) {
+      if (!make_room(out, run - i, limit)) return {};
+      out.insert(out.end(), text.begin() + static_cast<std::ptrdiff_t>(i),
+                 text.begin() + static_cast<std::ptrdiff_t>(run));
+      i = run;
+      if (i == n) break;
+    }
     // text[i] is "&". Its name ends at ";" within 8 characters, or at the
     // end of the text.
     std::size_t length = 0;
@@ -154,29 +174,38 @@ code_points decode_html(code_point_view text, std::uint64_t limit) {
 }
 
 bool html_needs_escaping(code_point_view text) {
-  for (const std::uint32_t c : text) {
-    if (c > 127 || is_markup(c)) return true;
-  }
-  return false;
+  return simd::find_first_code_point_in_set(kNeedsEscaping, text.data(), text.size()) !=
+         text.size();
 }
 
-std::string encode_html(code_point_view text, std::int64_t options, std::uint64_t limit) {
+out_buffer encode_html(code_point_view text, std::int64_t options, std::uint64_t limit,
+                       const scan_kernels& scan) {
   text = skip_byte_order_mark(text);
   const bool keep_markup = (options & 1) != 0;
   const ascii_actions& actions = keep_markup ? kKeepMarkup : kEscapeMarkup;
-  std::string out;
-  out.reserve(worst_case_reserve(text.size(), kMaxReferenceBytes, 0, limit));
-  for (const std::uint32_t c : text) {
-    bool fits;
-    if (c < 128) {
-      fits = append_text(out, actions[c], limit);
-    } else if (const std::string_view name = entity_name(c, true); !name.empty()) {
-      fits = append_named_reference(out, name, limit);
-    } else {
-      fits = append_numeric_reference(out, c, limit);
-    }
-    if (!fits) return {};
+  const simd::byte_set& work = keep_markup ? kEncodeWorkKeepMarkup : kEncodeWork;
+  const std::uint32_t* p = text.data();
+  const std::size_t n = text.size();
+  // Typical text grows little; the buffer grows (rarely) for more.
+  out_buffer out(worst_case_reserve(n, 1, n / 8 + 64, limit), limit);
+  std::size_t i = 0;
+  std::size_t after = kAfterMin;
+  while (i < n) {
+    const std::size_t chunk = n - i < kChunk ? n - i : kChunk;
+    if (!out.ensure(chunk + 64)) return out.discard();
+    const std::size_t run = scan.narrow_until_member(work, p + i, chunk, out.tail());
+    out.commit(run);
+    i += run;
+    if (run == chunk) continue;
+    after = run < kShortRun ? (after < kAfterMax ? 2 * after : after) : kAfterMin;
+    const std::size_t stop = n - i > after ? i + after : n;
+    if (!out.ensure((stop - i) * kMaxReferenceBytes)) return out.discard();
+    std::uint8_t* const first = out.tail();
+    std::uint8_t* o = first;
+    for (; i < stop; ++i) o = write_character(o, p[i], actions);
+    out.commit(static_cast<std::size_t>(o - first));
   }
+  if (!out.fits()) return out.discard();
   return out;
 }
 

@@ -11,6 +11,8 @@
 #include <string>
 #include <vector>
 
+#include "common/out_buffer.h"
+#include "common/scan.h"
 #include "common/size_gate.h"
 
 namespace zul::encodings {
@@ -31,10 +33,13 @@ bool html_needs_escaping(code_point_view text);
 // five are copied as they are. In both modes characters below U+0020 other
 // than tab, LF and CR are dropped, other ASCII is copied, and characters
 // from U+0080 up become "&name;" or "&#N;" (decimal). Output is ASCII, at
-// most 11 bytes per character; empty text gives an empty result, and so
-// does output that would pass limit bytes (encoding stops there).
-std::string encode_html(code_point_view text, std::int64_t options,
-                        std::uint64_t limit = kMaxResultBytes);
+// most 13 bytes per character; empty text gives an empty result, and so
+// does output that would pass limit bytes (encoding stops there). scan is
+// the search to use (tests pass every level's). Throws std::bad_alloc when
+// memory runs out.
+out_buffer encode_html(code_point_view text, std::int64_t options,
+                       std::uint64_t limit = kMaxResultBytes,
+                       const scan_kernels& scan = machine_scan());
 
 // Decodes references: "&" + name + ";" with a name of 1 to 8 characters (at
 // the very end of the text the ";" may be missing). A name of the table
@@ -42,6 +47,7 @@ std::string encode_html(code_point_view text, std::int64_t options,
 // value when it is 1 or more ("-" in the digits negates; characters after
 // the digits are ignored). Output is never longer than the input; output
 // past limit code points gives an empty result.
-code_points decode_html(code_point_view text, std::uint64_t limit = kMaxResultCodePoints);
+code_points decode_html(code_point_view text, std::uint64_t limit = kMaxResultCodePoints,
+                        const scan_kernels& scan = machine_scan());
 
 }  // namespace zul::encodings

@@ -6,6 +6,7 @@
 #include <string>
 #include <string_view>
 
+#include "common/scan.h"
 #include "common/size_gate.h"
 
 namespace zul::encodings {
@@ -17,7 +18,9 @@ bool subject_needs_encoding(std::string_view utf8);
 // The encoded word for a UTF-8 subject: space becomes "_"; "=", "?", "_",
 // bytes 0..31, 127 and 128..255 become "=" and two upper-case hex digits;
 // other bytes are kept. Size is at most 3 * size + 12 bytes; a word that
-// would pass limit bytes gives "" (encoding stops there).
-std::string encode_mail_subject(std::string_view utf8, std::uint64_t limit = kMaxResultBytes);
+// would pass limit bytes gives "" (encoding stops there). scan is the
+// byte-set search to use (tests pass every level's).
+std::string encode_mail_subject(std::string_view utf8, std::uint64_t limit = kMaxResultBytes,
+                                const scan_kernels& scan = machine_scan());
 
 }  // namespace zul::encodings

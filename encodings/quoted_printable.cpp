@@ -1,12 +1,16 @@
-// Quoted-printable: a byte-class table drives the encoder (one look-up per
-// byte); output is reserved once for the worst case, capped at the result
-// limit, where encoding stops. The decoder copies runs without
-// "=", CR or LF whole.
+// Quoted-printable: one pass each way, output reserved once (the encoder's
+// for the worst case, capped at the result limit, where encoding stops). A
+// byte-set search finds the next byte that needs work; the run of printable
+// bytes before it is copied a line's room at a time, with soft breaks
+// between. Only the bytes that need work (and a space or tab that ends a
+// run, which waits to see whether a line break follows) take the byte-class
+// table one by one. The decoder copies runs without "=", CR or LF whole.
 #include "encodings/quoted_printable.h"
 
 #include <array>
 
 #include "common/hex_digits.h"
+#include "common/scan.h"
 #include "common/size_gate.h"
 
 namespace zul::encodings {
@@ -31,6 +35,15 @@ constexpr std::array<byte_class, 256> kClasses = [] {
 }();
 
 constexpr std::string_view kLineBreak = "\r\n";
+
+// Bytes the encoder copies as they are, in runs: printable ASCII other than
+// "=", space and tab (a space or tab is encoded only before a line break,
+// and only the last byte of a run can be followed by one).
+constexpr simd::byte_set kEncoderWork = byte_set_where([](std::uint8_t b) {
+  return kClasses[b] != byte_class::literal && kClasses[b] != byte_class::whitespace;
+});
+constexpr simd::byte_set kDecoderWork =
+    byte_set_where([](std::uint8_t b) { return b == '=' || b == '\r' || b == '\n'; });
 
 // The state of one encoding run: output, column of the current output line
 // and the space or tab held back until we know whether a line break follows.
@@ -70,6 +83,33 @@ class encoder {
     out_ += '=';
     out_ += kHexDigits[b >> 4];
     out_ += kHexDigits[b & 15];
+  }
+
+  // Copies a run of literal bytes, spaces and tabs, none of them pending,
+  // as emit_literally would one by one: as much as fits before the line's
+  // wrap column, then a soft break, and so on.
+  void emit_run(const char* p, std::size_t n) {
+    const std::int64_t width = line_length_ - 2;  // a literal at this column wraps
+    while (n > 0) {
+      std::size_t take;
+      const bool wraps = column_ >= width;
+      if (wraps) {
+        const auto per_line = static_cast<std::uint64_t>(width > 1 ? width : 1);
+        take = static_cast<std::size_t>(n < per_line ? n : per_line);
+      } else {
+        const auto left = static_cast<std::uint64_t>(width - column_);
+        take = static_cast<std::size_t>(n < left ? n : left);
+      }
+      if (!room(take + (wraps ? 3 : 0))) return;
+      if (wraps) {
+        soft_break();
+        column_ = 0;
+      }
+      out_.append(p, take);
+      column_ += static_cast<std::int64_t>(take);
+      p += take;
+      n -= take;
+    }
   }
 
   void output_line_break() {
@@ -129,11 +169,12 @@ char partner(char c) { return c == '\r' ? '\n' : '\r'; }
 }  // namespace
 
 std::string encode_quoted_printable(std::string_view in, std::int64_t line_length,
-                                    std::uint64_t limit) {
+                                    std::uint64_t limit, const scan_kernels& scan) {
   std::int64_t width = static_cast<std::int32_t>(static_cast<std::uint32_t>(line_length));
   if (width <= 1) width = 72;
   encoder enc(in.size(), width, limit);
   bool had_line_break = false;
+  const auto* bytes = reinterpret_cast<const std::uint8_t*>(in.data());
   const std::size_t n = in.size();
   for (std::size_t i = 0; i < n && !enc.over(); ++i) {
     const char c = in[i];
@@ -142,10 +183,16 @@ std::string encode_quoted_printable(std::string_view in, std::int64_t line_lengt
         enc.flush_pending(false);
         enc.emit_hex_encoded(c);
         break;
-      case byte_class::literal:
+      case byte_class::literal: {
+        // A run of literals, spaces and tabs: all but a space or tab at its
+        // end go out as a block. The loop's ++i steps past the run's end.
+        std::size_t run = scan.find_first(kEncoderWork, bytes + i, n - i);
+        if (kClasses[bytes[i + run - 1]] == byte_class::whitespace) --run;
         enc.flush_pending(false);
-        enc.emit_literally(c);
+        enc.emit_run(in.data() + i, run);
+        i += run - 1;
         break;
+      }
       case byte_class::whitespace:
         enc.flush_pending(false);
         enc.hold(c);
@@ -161,7 +208,7 @@ std::string encode_quoted_printable(std::string_view in, std::int64_t line_lengt
   return enc.finish(had_line_break);
 }
 
-std::string decode_quoted_printable(std::string_view in) {
+std::string decode_quoted_printable(std::string_view in, const scan_kernels& scan) {
   const std::size_t n = in.size();
   std::string out;
   out.reserve(n + 1024);
@@ -171,12 +218,15 @@ std::string decode_quoted_printable(std::string_view in) {
     const char c = in[i++];
     if (i < n && in[i] == partner(c)) ++i;
   };
+  const auto* bytes = reinterpret_cast<const std::uint8_t*>(in.data());
   while (i < n) {
-    std::size_t run = i;
-    while (run < n && in[run] != '=' && !is_line_break(in[run])) ++run;
-    out.append(in.data() + i, run - i);
-    i = run;
-    if (i == n) break;
+    // Escapes and breaks back to back need no search.
+    if (!kDecoderWork.contains(bytes[i])) {
+      const std::size_t run = i + scan.find_first(kDecoderWork, bytes + i, n - i);
+      out.append(in.data() + i, run - i);
+      i = run;
+      if (i == n) break;
+    }
     if (is_line_break(in[i])) {
       skip_line_break();
       out += '\n';

@@ -7,6 +7,9 @@
 
 #include <string>
 
+#include "common/cpu.h"
+#include "tests/reference/quoted_printable_reference.h"
+
 namespace zul::encodings {
 namespace {
 
@@ -98,6 +101,36 @@ TEST(encode_quoted_printable, round_trips_every_byte_and_long_lines) {
     for (std::size_t end; (end = encoded.find("\r\n", start)) != std::string::npos;
          start = end + 2) {
       EXPECT_LE(end - start, static_cast<std::size_t>(std::max<std::int64_t>(line_length - 1, 4)));
+    }
+  }
+}
+
+// Both directions on every kernel against the byte-at-a-time references:
+// every byte value (and CR LF, "= ", "=\r\n", a space before a break) at
+// every position of lengths across the vector widths, at line lengths that
+// wrap inside and across runs.
+TEST(quoted_printable, every_kernel_matches_the_reference) {
+  std::vector<std::string> specials = {"\r\n", "\n\r", "= x", "=\r\n", " \n", "\t\r", "=4", "=4g"};
+  for (int b = 0; b < 256; ++b) specials.emplace_back(1, static_cast<char>(b));
+  for (const simd::isa level : simd::supported_isas()) {
+    SCOPED_TRACE(simd::isa_name(level));
+    const scan_kernels& scan = scan_for(level);
+    for (std::size_t n = 1; n <= 140; n += (n < 40 ? 1 : 13)) {
+      std::string in(n, 'w');
+      for (std::size_t k = 3; k < n; k += 4) in[k] = ' ';
+      for (std::size_t at = 0; at < n; ++at) {
+        for (std::size_t k = at % 7; k < specials.size(); k += (n == 53 && at == 33 ? 1 : 47)) {
+          std::string with = in;
+          with.replace(at, 1, specials[k]);
+          for (const std::int64_t line_length : {2, 5, 72}) {
+            ASSERT_EQ(encode_quoted_printable(with, line_length, kMaxResultBytes, scan),
+                      zul::reference::encode_quoted_printable_reference(with, line_length))
+                << "n " << n << " at " << at << " special " << k << " line " << line_length;
+          }
+          ASSERT_EQ(decode_quoted_printable(with, scan),
+                    zul::reference::decode_quoted_printable_reference(with));
+        }
+      }
     }
   }
 }

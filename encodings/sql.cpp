@@ -1,9 +1,13 @@
-// SQL helpers: one pass each, output reserved once from the input length.
-// The boolean rewriter tracks two quote flags and the position in the
-// current word; a word byte is anything but a separator, quotes included.
+// SQL helpers: one pass each, output reserved once from the input length
+// (neither output is ever longer). The boolean rewriter jumps from one
+// candidate byte to the next (a quote, or a "t" or "f" that starts a word:
+// encodings/sql_kernels.h) and, inside quotes, to the closing quote; the
+// bytes in between are copied whole. A word byte is anything but a
+// separator, quotes included.
 #include "encodings/sql.h"
 
 #include <array>
+#include <atomic>
 #include <cstdint>
 #include <cstring>
 
@@ -28,14 +32,10 @@ constexpr std::array<std::uint16_t, 256> kMySQLEscapes = [] {
   return table;
 }();
 
-constexpr std::array<bool, 256> kSeparators = [] {
-  std::array<bool, 256> table{};
-  for (unsigned b = 0; b < 256; ++b) table[b] = b <= 32 || b >= 128;
-  table['('] = table[')'] = table[','] = table[';'] = true;
-  return table;
-}();
+// Bytes checked one by one before a vector search starts.
+constexpr std::size_t kProbe = 16;
 
-bool is_separator(char c) { return kSeparators[static_cast<std::uint8_t>(c)]; }
+bool is_separator(char c) { return detail::is_sql_separator(static_cast<std::uint8_t>(c)); }
 
 // True when the bytes at p spell word (lower case) in any mixture of case.
 bool spells(const char* p, std::string_view word) {
@@ -73,35 +73,90 @@ std::string decode_mysql(std::string_view in) {
   return out;
 }
 
-std::string replace_sql_booleans(std::string_view utf8) {
+std::string replace_sql_booleans(std::string_view utf8, const detail::sql_kernels& kernels) {
+  const char* p = utf8.data();
+  const auto* bytes = reinterpret_cast<const std::uint8_t*>(p);
   const std::size_t n = utf8.size();
+  // The result ends before the first zero byte, and only input zeros write
+  // one; the "five bytes follow" rule still counts the whole input.
+  const void* zero = n == 0 ? nullptr : std::memchr(p, 0, n);
+  const std::size_t end = zero ? static_cast<std::size_t>(static_cast<const char*>(zero) - p) : n;
   std::string out;
-  out.reserve(n + 10);
-  bool in_single = false;
-  bool in_double = false;
-  std::size_t word_position = 0;
-  for (std::size_t i = 0; i < n; ++i) {
-    const char c = utf8[i];
-    if (c == '\'' && !in_double) in_single = !in_single;
-    if (c == '"' && !in_single) in_double = !in_double;
-    word_position = is_separator(c) ? 0 : word_position + 1;
-    if (!in_single && !in_double && word_position == 1 && i + 5 < n) {
-      const char* p = utf8.data() + i;
-      if (spells(p, "false") && is_separator(p[5])) {
-        out += '0';
-        i += 4;
-        continue;
-      }
-      if (spells(p, "true") && is_separator(p[4])) {
-        out += '1';
-        i += 3;
-        continue;
+  out.reserve(end);
+  std::size_t copied = 0;  // bytes before this are in out
+  std::size_t i = 0;
+  char quote = 0;  // the open quote, if any
+  while (i < end) {
+    if (quote != 0) {
+      const void* close = std::memchr(p + i, quote, end - i);
+      if (close == nullptr) break;
+      i = static_cast<std::size_t>(static_cast<const char*>(close) - p) + 1;
+      quote = 0;
+      continue;
+    }
+    // The first byte starts a word; later ones come from the search, which
+    // reads the byte before.
+    std::size_t at = i;
+    if (i != 0 || !(detail::is_sql_quote(bytes[0]) || detail::is_boolean_initial(bytes[0]))) {
+      if (i == 0) i = 1;
+      // A few bytes one by one first: in text dense with quotes and words a
+      // vector search would start up for every candidate.
+      const std::size_t probe = end - i < kProbe ? end - i : kProbe;
+      at = i + detail::find_boolean_candidate_scalar(bytes + i, probe);
+      if (at == i + probe) at += kernels.find_boolean_candidate(bytes + at, end - at);
+      if (at >= end) break;
+    }
+    if (detail::is_sql_quote(bytes[at])) {
+      quote = p[at];
+      i = at + 1;
+      continue;
+    }
+    std::size_t length = 0;
+    char digit = 0;
+    if (at + 5 < n) {
+      if (spells(p + at, "false") && is_separator(p[at + 5])) {
+        length = 5;
+        digit = '0';
+      } else if (spells(p + at, "true") && is_separator(p[at + 4])) {
+        length = 4;
+        digit = '1';
       }
     }
-    out += c;
+    if (length == 0) {
+      i = at + 1;
+      continue;
+    }
+    out.append(p + copied, at - copied);
+    out += digit;
+    i = copied = at + length;
   }
-  if (const std::size_t zero = out.find('\0'); zero != std::string::npos) out.resize(zero);
+  out.append(p + copied, end - copied);
   return out;
 }
 
+namespace detail {
+
+std::size_t find_boolean_candidate_scalar(const std::uint8_t* p, std::size_t n) noexcept {
+  for (std::size_t i = 0; i < n; ++i) {
+    if (is_sql_quote(p[i]) || (is_boolean_initial(p[i]) && is_sql_separator(p[i - 1]))) return i;
+  }
+  return n;
+}
+
+namespace {
+constexpr sql_kernels kScalar{find_boolean_candidate_scalar};
+#if defined(__x86_64__) || defined(_M_X64)
+constexpr sql_kernels kAvx2{find_boolean_candidate_avx2};
+constexpr sql_kernels kAvx512{find_boolean_candidate_avx512};
+constexpr simd::family_tables<sql_kernels> kTables{&kScalar, nullptr, &kAvx2, &kAvx512, nullptr};
+#else
+constexpr simd::family_tables<sql_kernels> kTables{&kScalar};
+#endif
+std::atomic<const sql_kernels*> active_kernels{nullptr};
+}  // namespace
+
+const simd::family_tables<sql_kernels>& sql_tables() noexcept { return kTables; }
+const sql_kernels& machine_sql_kernels() noexcept { return simd::active(kTables, active_kernels); }
+
+}  // namespace detail
 }  // namespace zul::encodings

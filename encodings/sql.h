@@ -7,6 +7,8 @@
 #include <string>
 #include <string_view>
 
+#include "encodings/sql_kernels.h"
+
 namespace zul::encodings {
 
 // Decodes backslash escapes: \0 \' \" \b \n \r \t \Z \\ \% \_ (letters
@@ -18,7 +20,9 @@ std::string decode_mysql(std::string_view in);
 // separator (or at the start), is followed by a separator, at least five
 // bytes follow its first letter, and no quote is open. Separators: bytes
 // 0..32 and 128..255, "(", ")", "," and ";". Quotes toggle with no escape
-// rule. The result ends before the first zero byte of the output.
-std::string replace_sql_booleans(std::string_view utf8);
+// rule. The result ends before the first zero byte of the output. kernels
+// are the candidate search to use (tests pass every level's).
+std::string replace_sql_booleans(
+    std::string_view utf8, const detail::sql_kernels& kernels = detail::machine_sql_kernels());
 
 }  // namespace zul::encodings

@@ -3,7 +3,10 @@
 
 #include <gtest/gtest.h>
 
+#include <string>
 #include <string_view>
+
+#include "tests/reference/sql_reference.h"
 
 namespace zul::encodings {
 namespace {
@@ -56,6 +59,49 @@ TEST(replace_sql_booleans, words_outside_quotes) {
   for (const auto& row : rows) {
     SCOPED_TRACE(row.why);
     EXPECT_EQ(replace_sql_booleans(row.in), row.want);
+  }
+}
+
+// The candidate search on every kernel: every pair of (previous, current)
+// byte values at every position of lengths across the vector widths.
+TEST(find_boolean_candidate, all_byte_pairs_on_every_kernel) {
+  for (const simd::isa level : simd::supported_isas()) {
+    SCOPED_TRACE(simd::isa_name(level));
+    const detail::sql_kernels& k = detail::sql_kernels_for(level);
+    std::string buf(200, 'x');
+    const auto* p = reinterpret_cast<const std::uint8_t*>(buf.data()) + 1;
+    for (unsigned before = 0; before < 256; ++before) {
+      for (unsigned b = 0; b < 256; ++b) {
+        const std::size_t at = (before * 7 + b) % 130, n = at + 1 + b % 67;
+        buf[1 + at - 1] = static_cast<char>(before);
+        buf[1 + at] = static_cast<char>(b);
+        ASSERT_EQ(k.find_boolean_candidate(p, n), detail::find_boolean_candidate_scalar(p, n))
+            << before << " " << b << " at " << at;
+        buf[1 + at - 1] = buf[1 + at] = 'x';
+      }
+    }
+  }
+}
+
+// The rewrite on every kernel against the byte-at-a-time reference: words,
+// quotes and zero bytes at every position of lengths across the widths.
+TEST(replace_sql_booleans, every_kernel_matches_the_reference) {
+  const std::string_view pieces[] = {" true ", "(FALSE,", "'", "\"", "\0"sv, "tRuE;", " f", "t"};
+  for (const simd::isa level : simd::supported_isas()) {
+    SCOPED_TRACE(simd::isa_name(level));
+    const detail::sql_kernels& k = detail::sql_kernels_for(level);
+    for (std::size_t n = 0; n <= 140; n += (n < 70 ? 1 : 7)) {
+      const std::string plain = std::string(n, 'a').replace(0, n / 2, n / 2, ' ');
+      for (std::size_t at = 0; at <= n; ++at) {
+        for (const std::string_view piece : pieces) {
+          std::string in = plain;
+          in.insert(at, piece);
+          in.insert(in.size() - at / 2, piece);
+          ASSERT_EQ(replace_sql_booleans(in, k), zul::reference::replace_sql_booleans_reference(in))
+              << in;
+        }
+      }
+    }
   }
 }
 

@@ -20,10 +20,12 @@ bool xml_needs_escaping(code_point_view text);
 // bit 0 clear) or "&apos;" (bit 0 set), the others as "&quot;", "&amp;",
 // "&lt;", "&gt;". A leading U+FEFF or U+FFFE is dropped, as are characters
 // below U+0020 other than tab, LF and CR; all else is copied. At most 6
-// code points per character. Output that would pass limit code points gives
+// code points per character. scan is the search to use (tests pass every
+// level's). Output that would pass limit code points gives
 // an empty result (escaping stops there).
 code_points encode_xml(code_point_view text, std::int64_t options,
-                       std::uint64_t limit = kMaxResultCodePoints);
+                       std::uint64_t limit = kMaxResultCodePoints,
+                       const scan_kernels& scan = machine_scan());
 
 // True when no byte is 0, 128 or more, or one of the five markup bytes (an
 // empty text passes). Stops at the first offending byte.

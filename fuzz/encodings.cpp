@@ -3,9 +3,9 @@
 // Invariants:
 //  1. no crash, no read outside the input (run under the sanitizers);
 //  2. every decoder accepts every byte sequence;
-//  3. fast paths equal their scalar references (URL, HTML, yEnc, tag
-//     removal), at every
-//     kernel level the machine has;
+//  3. fast paths equal their scalar references (URL, HTML, XML,
+//     quoted-printable, yEnc, tag removal, SQL booleans), at every kernel
+//     level the machine has;
 //  4. decode(encode(x)) == x for URL with options 0 to 2, and for
 //     quoted-printable text without line breaks (those become CR LF / LF).
 #include <cstdint>
@@ -19,11 +19,15 @@
 #include "encodings/quoted_printable.h"
 #include "encodings/sql.h"
 #include "encodings/url.h"
+#include "encodings/xml.h"
 #include "encodings/yenc.h"
 #include "fuzz/fuzz_check.h"
 #include "tests/reference/html_reference.h"
 #include "tests/reference/html_tags_reference.h"
+#include "tests/reference/quoted_printable_reference.h"
+#include "tests/reference/sql_reference.h"
 #include "tests/reference/url_reference.h"
+#include "tests/reference/xml_reference.h"
 #include "tests/reference/yenc_reference.h"
 
 using zul_fuzz::check;
@@ -61,9 +65,15 @@ extern "C" int LLVMFuzzerTestOneInput(const std::uint8_t* data, std::size_t size
       } else {
         text.assign(p, p + in.size());
       }
-      check(enc::encode_html(text, options) ==
-            zul::reference::encode_html_reference(text, options));
-      check(enc::decode_html(text) == zul::reference::decode_html_reference(text));
+      const std::string html = zul::reference::encode_html_reference(text, options);
+      const enc::code_points decoded = zul::reference::decode_html_reference(text);
+      const enc::code_points xml = zul::reference::encode_xml_reference(text, options);
+      for (const zul::simd::isa level : zul::simd::supported_isas()) {
+        const zul::scan_kernels& scan = zul::scan_for(level);
+        check(enc::encode_html(text, options, zul::kMaxResultBytes, scan) == html);
+        check(enc::decode_html(text, enc::kMaxResultCodePoints, scan) == decoded);
+        check(enc::encode_xml(text, options, enc::kMaxResultCodePoints, scan) == xml);
+      }
       break;
     }
     case 3:
@@ -74,7 +84,15 @@ extern "C" int LLVMFuzzerTestOneInput(const std::uint8_t* data, std::size_t size
       std::erase_if(flat, [](char c) { return c == '\r' || c == '\n'; });
       check(enc::decode_quoted_printable(enc::encode_quoted_printable(flat, 4 + options * 8)) ==
             flat);
-      (void)enc::decode_quoted_printable(in);
+      const std::string encoded =
+          zul::reference::encode_quoted_printable_reference(in, 4 + options * 8);
+      const std::string decoded = zul::reference::decode_quoted_printable_reference(in);
+      for (const zul::simd::isa level : zul::simd::supported_isas()) {
+        const zul::scan_kernels& scan = zul::scan_for(level);
+        check(enc::encode_quoted_printable(in, 4 + options * 8, zul::kMaxResultBytes, scan) ==
+              encoded);
+        check(enc::decode_quoted_printable(in, scan) == decoded);
+      }
       break;
     }
     default:
@@ -84,7 +102,10 @@ extern "C" int LLVMFuzzerTestOneInput(const std::uint8_t* data, std::size_t size
         check(enc::remove_html_tags(in, with, zul::kMaxResultBytes, zul::scan_for(level)) ==
               zul::reference::remove_html_tags_reference(in, with));
       }
-      (void)enc::replace_sql_booleans(in);
+      for (const zul::simd::isa level : zul::simd::supported_isas()) {
+        check(enc::replace_sql_booleans(in, enc::detail::sql_kernels_for(level)) ==
+              zul::reference::replace_sql_booleans_reference(in));
+      }
       break;
   }
   return 0;

@@ -77,7 +77,7 @@ TEST(size_gate, every_gated_worker_stops_exactly_at_its_limit) {
          return enc::encode_mail_subject("h\xC3\xA9llo w\xC3\xB6rld?", limit);
        })},
       {"HTML encoding",
-       sized<std::string>([&](auto limit) { return enc::encode_html(html_view, 0, limit); })},
+       sized<zul::out_buffer>([&](auto limit) { return enc::encode_html(html_view, 0, limit); })},
       {"HTML decoding (code points)",
        sized<enc::code_points>([&](auto limit) { return enc::decode_html(refs_view, limit); })},
       {"XML escaping (code points)",

@@ -97,12 +97,24 @@ TEST(encode_single_byte, special_unit_at_every_position_on_every_kernel) {
       for (const std::uint16_t special : specials) {
         std::vector<std::uint16_t> in = text;
         in[at] = special;
+        // and, at every third position, with a second one in the same block
+        // or the next (patched in place, or dropped after the first was
+        // patched)
+        std::vector<std::uint16_t> pair = in;
+        pair[(at + 7) % length] = 0x2122;
         for (const auto& s : kSets) {
           const std::string want = zul::reference::encode_single_byte_reference(in, s.table);
+          const bool with_pair = at % 3 == 0;
+          const std::string want_pair =
+              with_pair ? zul::reference::encode_single_byte_reference(pair, s.table) : "";
           for (const zul::simd::isa level : zul::simd::supported_isas()) {
             ASSERT_EQ(bytes_of(encode_single_byte(in, s.set, kHandleLimit, kernels(level))), want)
                 << s.name << " " << zul::simd::isa_name(level) << " length " << length << " at "
                 << at << " unit " << special;
+            if (!with_pair) continue;
+            ASSERT_EQ(bytes_of(encode_single_byte(pair, s.set, kHandleLimit, kernels(level))),
+                      want_pair)
+                << s.name << " " << zul::simd::isa_name(level) << " pair at " << at;
           }
         }
       }

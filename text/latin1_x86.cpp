@@ -2,10 +2,10 @@
 // block of bytes to units with zero extension and stores it; lanes holding
 // 80..9F are then patched from the table (AVX-512: one 32-unit permute of
 // the whole block). Encoding narrows a block of units to bytes and stores
-// it whole, then keeps only the lanes before the first unit that is not a
-// plain 00..FF value of the set; that unit takes the table look-up and the
-// next block starts right after it (the output never passes the input, so
-// the whole-block store always has room).
+// it whole; the few units that are not plain 00..FF values of the set take
+// the table look-up in place (finish_block), and denser blocks are finished
+// from the first such unit (the output never passes the input, so the
+// whole-block store always has room).
 // Compiled on x86-64 only; other targets get an empty unit.
 #if defined(__x86_64__) || defined(_M_X64)
 #include <immintrin.h>
@@ -34,11 +34,33 @@ inline std::size_t encode_units(const std::uint16_t* in, std::size_t count, std:
   return o;
 }
 
-// The rest of a block from its first lane needing the table (bit k of m):
-// a lone such lane takes the look-up and the next block starts after it;
-// with more than one, the rest of the block goes unit by unit.
+// The rest of a block whose lanes in m need the table; out[o, o + block)
+// holds the block narrowed. When patch is set (a set that holds units
+// beyond 00..FF) and there are few such lanes (typical text: a sign or a
+// quotation mark now and then), each takes the look-up in place and, when
+// the set holds them all, the next block starts after this one. Otherwise,
+// from the first such lane k: a lone one takes the look-up and the next
+// block starts after it; with more than one, the rest of the block goes unit
+// by unit.
 inline void finish_block(const std::uint16_t* in, std::uint8_t* out, unsigned m, unsigned block,
-                         const single_byte_charset& set, std::size_t& i, std::size_t& o) {
+                         const single_byte_charset& set, bool patch, std::size_t& i,
+                         std::size_t& o) {
+  if (patch && __builtin_popcount(m) <= 4) {
+    std::uint8_t* const first = out + o;
+    const std::uint16_t* const units = in + i;
+    unsigned left = m;
+    for (; left != 0; left &= left - 1) {
+      const unsigned lane = static_cast<unsigned>(__builtin_ctz(left));
+      const int b = byte_for_unit(set, units[lane]);
+      if (b < 0) break;
+      first[lane] = static_cast<std::uint8_t>(b);
+    }
+    if (left == 0) {
+      i += block;
+      o += block;
+      return;
+    }
+  }
   const unsigned k = static_cast<unsigned>(__builtin_ctz(m));
   const unsigned rest = (m & (m - 1)) == 0 ? 1 : block - k;
   o += k + encode_units(in + i + k, rest, out + o + k, set);
@@ -108,7 +130,7 @@ std::size_t encode_sse2(const std::uint16_t* in, std::size_t n, std::uint8_t* ou
       o += 16;
       continue;
     }
-    finish_block(in, out, m, 16, set, i, o);
+    finish_block(in, out, m, 16, set, !c1_identity, i, o);
   }
   *written = o;
   return i;
@@ -166,7 +188,7 @@ ZUL_AVX2 std::size_t encode_avx2(const std::uint16_t* in, std::size_t n, std::ui
       o += 32;
       continue;
     }
-    finish_block(in, out, m, 32, set, i, o);
+    finish_block(in, out, m, 32, set, !c1_identity, i, o);
   }
   *written = o;
   return i;
@@ -218,7 +240,7 @@ ZUL_AVX512 std::size_t encode_avx512(const std::uint16_t* in, std::size_t n, std
       o += 32;
       continue;
     }
-    finish_block(in, out, m, 32, set, i, o);
+    finish_block(in, out, m, 32, set, !c1_identity, i, o);
   }
   *written = o;
   return i;

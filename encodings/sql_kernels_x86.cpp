@@ -1,0 +1,108 @@
+// The boolean-candidate search for x86-64, compiled per function for AVX2
+// and AVX-512 (BW). Each byte gets a class from two nibble look-ups (the
+// method of shuffle-based character classes): class = lo[b & 15] & hi[b >> 4],
+// exact because every class bit stands for one rectangle of low and high
+// nibbles:
+//   bit 0  quote          hi 2, lo 2 or 7       (" ')
+//   bit 1  t T            hi 5 or 7, lo 4
+//   bit 2  f F            hi 4 or 6, lo 6
+//   bit 3  separator      hi 0, 1, 8..15, any lo (0..31, 128..255)
+//   bit 4  separator      hi 2, lo 0, 8, 9, 12   (space ( ) ,)
+//   bit 5  separator      hi 3, lo 11            (;)
+// The previous bytes are classified from a second load one byte back; a
+// byte is a candidate when it is a quote, or an initial after a separator.
+#include "encodings/sql_kernels.h"
+
+#if defined(__x86_64__) || defined(_M_X64)
+#include <immintrin.h>
+
+#define ZUL_AVX2 __attribute__((target("avx2,bmi,bmi2")))
+#define ZUL_AVX512 __attribute__((target("avx2,bmi,bmi2,avx512f,avx512bw,avx512vl,avx512dq")))
+
+namespace zul::encodings::detail {
+namespace {
+
+constexpr char kQuote = 0x01, kInitial = 0x06, kSeparator = 0x38;
+
+// lo[l] and hi[h] of the class table above.
+constexpr char kLow[16] = {0x18, 0x08, 0x09, 0x08, 0x0A, 0x08, 0x0C, 0x09,
+                           0x18, 0x18, 0x08, 0x28, 0x18, 0x08, 0x08, 0x08};
+constexpr char kHigh[16] = {0x08, 0x08, 0x11, 0x20, 0x04, 0x02, 0x04, 0x02,
+                            0x08, 0x08, 0x08, 0x08, 0x08, 0x08, 0x08, 0x08};
+
+struct classes256 {
+  __m256i low, high, nibble;
+};
+
+ZUL_AVX2 inline __m256i classify256(const classes256& t, __m256i v) {
+  const __m256i lo = _mm256_shuffle_epi8(t.low, _mm256_and_si256(v, t.nibble));
+  const __m256i hi =
+      _mm256_shuffle_epi8(t.high, _mm256_and_si256(_mm256_srli_epi16(v, 4), t.nibble));
+  return _mm256_and_si256(lo, hi);
+}
+
+// Bit i set where lane i of v has a bit of bits.
+ZUL_AVX2 inline std::uint32_t any_bits256(__m256i v, char bits) {
+  const __m256i none =
+      _mm256_cmpeq_epi8(_mm256_and_si256(v, _mm256_set1_epi8(bits)), _mm256_setzero_si256());
+  return ~static_cast<std::uint32_t>(_mm256_movemask_epi8(none));
+}
+
+// The masked form: GCC 12 flags the plain broadcast's undefined source.
+ZUL_AVX512 inline __m512i broadcast512(const char* table) {
+  return _mm512_maskz_broadcast_i32x4(static_cast<__mmask16>(0xFFFF),
+                                      _mm_loadu_si128(reinterpret_cast<const __m128i*>(table)));
+}
+
+struct classes512 {
+  __m512i low, high, nibble;
+};
+
+ZUL_AVX512 inline __m512i classify512(const classes512& t, __m512i v) {
+  const __m512i lo = _mm512_shuffle_epi8(t.low, _mm512_and_si512(v, t.nibble));
+  const __m512i hi =
+      _mm512_shuffle_epi8(t.high, _mm512_and_si512(_mm512_srli_epi16(v, 4), t.nibble));
+  return _mm512_and_si512(lo, hi);
+}
+
+}  // namespace
+
+ZUL_AVX2 std::size_t find_boolean_candidate_avx2(const std::uint8_t* p, std::size_t n) noexcept {
+  const classes256 t{
+      _mm256_broadcastsi128_si256(_mm_loadu_si128(reinterpret_cast<const __m128i*>(kLow))),
+      _mm256_broadcastsi128_si256(_mm_loadu_si128(reinterpret_cast<const __m128i*>(kHigh))),
+      _mm256_set1_epi8(0x0F)};
+  std::size_t i = 0;
+  for (; n - i >= 32; i += 32) {
+    const __m256i c = classify256(t, _mm256_loadu_si256(reinterpret_cast<const __m256i*>(p + i)));
+    const __m256i before =
+        classify256(t, _mm256_loadu_si256(reinterpret_cast<const __m256i*>(p + i - 1)));
+    const std::uint32_t m =
+        any_bits256(c, kQuote) | (any_bits256(c, kInitial) & any_bits256(before, kSeparator));
+    if (m != 0) return i + static_cast<std::size_t>(__builtin_ctz(m));
+  }
+  return i + find_boolean_candidate_scalar(p + i, n - i);
+}
+
+ZUL_AVX512 std::size_t find_boolean_candidate_avx512(const std::uint8_t* p,
+                                                     std::size_t n) noexcept {
+  const classes512 t{broadcast512(kLow), broadcast512(kHigh), _mm512_set1_epi8(0x0F)};
+  const __m512i quote = _mm512_set1_epi8(kQuote), initial = _mm512_set1_epi8(kInitial),
+                separator = _mm512_set1_epi8(kSeparator);
+  for (std::size_t i = 0; i < n; i += 64) {
+    const std::size_t left = n - i;
+    const __mmask64 live =
+        left >= 64 ? ~__mmask64{0} : _bzhi_u64(~0ull, static_cast<unsigned>(left));
+    const __m512i c = classify512(t, _mm512_maskz_loadu_epi8(live, p + i));
+    const __m512i before = classify512(t, _mm512_maskz_loadu_epi8(live, p + i - 1));
+    const __mmask64 m =
+        (_mm512_test_epi8_mask(c, quote) |
+         (_mm512_test_epi8_mask(c, initial) & _mm512_test_epi8_mask(before, separator))) &
+        live;
+    if (m != 0) return i + static_cast<std::size_t>(__builtin_ctzll(m));
+  }
+  return n;
+}
+
+}  // namespace zul::encodings::detail
+#endif

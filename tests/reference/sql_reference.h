@@ -1,0 +1,12 @@
+// The TRUE / FALSE rewrite one byte at a time, following its rules
+// directly: the reference for replace_sql_booleans (encodings/sql.h).
+#pragma once
+
+#include <string>
+#include <string_view>
+
+namespace zul::reference {
+
+std::string replace_sql_booleans_reference(std::string_view utf8);
+
+}  // namespace zul::reference
