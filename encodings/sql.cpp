@@ -137,8 +137,9 @@ std::string replace_sql_booleans(std::string_view utf8, const detail::sql_kernel
 namespace detail {
 
 std::size_t find_boolean_candidate_scalar(const std::uint8_t* p, std::size_t n) noexcept {
+  const std::uint8_t* before = p - 1;  // the byte before p is readable (see the header)
   for (std::size_t i = 0; i < n; ++i) {
-    if (is_sql_quote(p[i]) || (is_boolean_initial(p[i]) && is_sql_separator(p[i - 1]))) return i;
+    if (is_sql_quote(p[i]) || (is_boolean_initial(p[i]) && is_sql_separator(before[i]))) return i;
   }
   return n;
 }
