@@ -43,6 +43,9 @@ constexpr count_kernels kSse2{count_byte_sse2, count_pattern_sse2};
 constexpr count_kernels kAvx2{count_byte_avx2, count_pattern_avx2};
 constexpr count_kernels kAvx512{count_byte_avx512, count_pattern_avx512};
 constexpr simd::family_tables<count_kernels> kTables{&kScalar, &kSse2, &kAvx2, &kAvx512, nullptr};
+#elif defined(__aarch64__)
+constexpr count_kernels kNeon{count_byte_neon, count_pattern_neon};
+constexpr simd::family_tables<count_kernels> kTables{&kScalar, nullptr, nullptr, nullptr, &kNeon};
 #else
 constexpr simd::family_tables<count_kernels> kTables{&kScalar};
 #endif

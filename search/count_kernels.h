@@ -32,6 +32,7 @@ std::uint64_t count_byte_scalar(const std::uint8_t* p, std::size_t n, std::uint8
 std::uint64_t count_byte_sse2(const std::uint8_t* p, std::size_t n, std::uint8_t b) noexcept;
 std::uint64_t count_byte_avx2(const std::uint8_t* p, std::size_t n, std::uint8_t b) noexcept;
 std::uint64_t count_byte_avx512(const std::uint8_t* p, std::size_t n, std::uint8_t b) noexcept;
+std::uint64_t count_byte_neon(const std::uint8_t* p, std::size_t n, std::uint8_t b) noexcept;
 std::uint64_t count_pattern_scalar(const std::uint8_t* p, std::size_t n, const std::uint8_t* find,
                                    std::size_t m) noexcept;
 std::uint64_t count_pattern_sse2(const std::uint8_t* p, std::size_t n, const std::uint8_t* find,
@@ -40,5 +41,7 @@ std::uint64_t count_pattern_avx2(const std::uint8_t* p, std::size_t n, const std
                                  std::size_t m) noexcept;
 std::uint64_t count_pattern_avx512(const std::uint8_t* p, std::size_t n, const std::uint8_t* find,
                                    std::size_t m) noexcept;
+std::uint64_t count_pattern_neon(const std::uint8_t* p, std::size_t n, const std::uint8_t* find,
+                                 std::size_t m) noexcept;
 
 }  // namespace zul::search::detail
