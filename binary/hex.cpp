@@ -82,6 +82,9 @@ constexpr hex_kernels kSse2{encode_hex_sse2, decode_hex_sse2, spaced_pairs_scala
 constexpr hex_kernels kAvx2{encode_hex_avx2, decode_hex_avx2, spaced_pairs_avx2};
 constexpr hex_kernels kAvx512{encode_hex_avx512, decode_hex_avx512, spaced_pairs_avx2};
 constexpr simd::family_tables<hex_kernels> kTables{&kScalar, &kSse2, &kAvx2, &kAvx512, nullptr};
+#elif defined(__aarch64__)
+constexpr hex_kernels kNeon{encode_hex_neon, decode_hex_neon, spaced_pairs_scalar};
+constexpr simd::family_tables<hex_kernels> kTables{&kScalar, nullptr, nullptr, nullptr, &kNeon};
 #else
 constexpr simd::family_tables<hex_kernels> kTables{&kScalar};
 #endif

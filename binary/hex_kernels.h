@@ -33,5 +33,7 @@ void encode_hex_avx2(const std::uint8_t* in, std::size_t n, char* out) noexcept;
 void decode_hex_avx2(const char* in, std::size_t n, std::uint8_t* out) noexcept;
 void encode_hex_avx512(const std::uint8_t* in, std::size_t n, char* out) noexcept;
 void decode_hex_avx512(const char* in, std::size_t n, std::uint8_t* out) noexcept;
+void encode_hex_neon(const std::uint8_t* in, std::size_t n, char* out) noexcept;
+void decode_hex_neon(const char* in, std::size_t n, std::uint8_t* out) noexcept;
 
 }  // namespace zul::binary::detail
