@@ -51,6 +51,9 @@ const simd::family_tables<bitwise_kernels>& bitwise_tables() noexcept {
 #if defined(__x86_64__) || defined(_M_X64)
   static const simd::family_tables<bitwise_kernels> tables{&kBitwiseScalar, nullptr, &kBitwiseAvx2,
                                                            &kBitwiseAvx512};
+#elif defined(__aarch64__)
+  static const simd::family_tables<bitwise_kernels> tables{&kBitwiseScalar, nullptr, nullptr,
+                                                           nullptr, &kBitwiseNeon};
 #else
   static const simd::family_tables<bitwise_kernels> tables{&kBitwiseScalar};
 #endif

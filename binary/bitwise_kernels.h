@@ -26,5 +26,6 @@ const bitwise_kernels& active_bitwise_kernels() noexcept;
 extern const bitwise_kernels kBitwiseScalar;
 extern const bitwise_kernels kBitwiseAvx2;
 extern const bitwise_kernels kBitwiseAvx512;
+extern const bitwise_kernels kBitwiseNeon;
 
 }  // namespace zul::binary::detail
