@@ -22,6 +22,10 @@ constexpr char_class_kernels kAvx2{replace_non_printable_avx2};
 constexpr char_class_kernels kAvx512{replace_non_printable_avx512};
 constexpr simd::family_tables<char_class_kernels> kTables{&kScalar, nullptr, &kAvx2, &kAvx512,
                                                           nullptr};
+#elif defined(__aarch64__)
+constexpr char_class_kernels kNeon{replace_non_printable_neon};
+constexpr simd::family_tables<char_class_kernels> kTables{&kScalar, nullptr, nullptr, nullptr,
+                                                          &kNeon};
 #else
 constexpr simd::family_tables<char_class_kernels> kTables{&kScalar};
 #endif

@@ -25,5 +25,7 @@ void replace_non_printable_avx2(const std::uint8_t* in, std::size_t n, std::uint
                                 std::uint8_t* out) noexcept;
 void replace_non_printable_avx512(const std::uint8_t* in, std::size_t n, std::uint8_t replacement,
                                   std::uint8_t* out) noexcept;
+void replace_non_printable_neon(const std::uint8_t* in, std::size_t n, std::uint8_t replacement,
+                                std::uint8_t* out) noexcept;
 
 }  // namespace zul::text::detail
