@@ -6,6 +6,7 @@
 
 #include <cstddef>
 #include <cstdint>
+#include <cstring>
 
 #include "common/dispatch.h"
 
@@ -27,6 +28,24 @@ const count_kernels& active_count_kernels() noexcept;
 // `next`, the first start allowed by the non-overlapping rule.
 std::uint64_t count_pattern_from(const std::uint8_t* p, std::size_t n, const std::uint8_t* find,
                                  std::size_t m, std::size_t from, std::size_t next) noexcept;
+
+// Checks one block's candidates in order: each set bit of `candidates`
+// marks the position base + (bit index >> shift) (shift 2 where a compare
+// mask gives four bits a byte); a position before `next` overlaps the last
+// match and is skipped, the others are compared in full.
+inline void check_candidates(std::uint64_t candidates, unsigned shift, std::size_t base,
+                             const std::uint8_t* p, const std::uint8_t* find, std::size_t m,
+                             std::size_t& next, std::uint64_t& count) noexcept {
+  while (candidates != 0) {
+    const std::size_t pos = base + (static_cast<std::size_t>(__builtin_ctzll(candidates)) >> shift);
+    candidates &= candidates - 1;
+    if (pos < next) continue;
+    if (m <= 2 || std::memcmp(p + pos + 1, find + 1, m - 2) == 0) {
+      ++count;
+      next = pos + m;
+    }
+  }
+}
 
 std::uint64_t count_byte_scalar(const std::uint8_t* p, std::size_t n, std::uint8_t b) noexcept;
 std::uint64_t count_byte_sse2(const std::uint8_t* p, std::size_t n, std::uint8_t b) noexcept;

@@ -49,15 +49,7 @@ std::uint64_t count_pattern_neon(const std::uint8_t* p, std::size_t n, const std
     std::uint64_t candidates =
         vget_lane_u64(vreinterpret_u64_u8(vshrn_n_u16(vreinterpretq_u16_u8(both), 4)), 0) &
         0x8888888888888888u;
-    while (candidates != 0) {
-      const std::size_t pos = i + static_cast<std::size_t>(__builtin_ctzll(candidates) >> 2);
-      candidates &= candidates - 1;
-      if (pos < next) continue;
-      if (m <= 2 || std::memcmp(p + pos + 1, find + 1, m - 2) == 0) {
-        ++count;
-        next = pos + m;
-      }
-    }
+    check_candidates(candidates, 2, i, p, find, m, next, count);
   }
   return count + count_pattern_from(p, n, find, m, i, next);
 }

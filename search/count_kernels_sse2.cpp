@@ -56,15 +56,7 @@ std::uint64_t count_pattern_sse2(const std::uint8_t* p, std::size_t n, const std
     const __m128i z = _mm_loadu_si128(reinterpret_cast<const __m128i*>(p + i + m - 1));
     const __m128i both = _mm_and_si128(_mm_cmpeq_epi8(a, first), _mm_cmpeq_epi8(z, last));
     auto candidates = static_cast<unsigned>(_mm_movemask_epi8(both));
-    while (candidates != 0) {
-      const std::size_t pos = i + static_cast<std::size_t>(__builtin_ctz(candidates));
-      candidates &= candidates - 1;
-      if (pos < next) continue;
-      if (m <= 2 || std::memcmp(p + pos + 1, find + 1, m - 2) == 0) {
-        ++count;
-        next = pos + m;
-      }
-    }
+    check_candidates(candidates, 0, i, p, find, m, next, count);
   }
   return count + count_pattern_from(p, n, find, m, i, next);
 }

@@ -22,24 +22,6 @@
 #define ZUL_AVX512 __attribute__((target("avx2,bmi,bmi2,avx512f,avx512bw,avx512vl,avx512dq")))
 
 namespace zul::search::detail {
-namespace {
-
-// Checks the candidates of one block at positions base + bit, in order.
-inline void check_candidates(std::uint64_t candidates, std::size_t base, const std::uint8_t* p,
-                             const std::uint8_t* find, std::size_t m, std::size_t& next,
-                             std::uint64_t& count) {
-  while (candidates != 0) {
-    const std::size_t pos = base + static_cast<std::size_t>(__builtin_ctzll(candidates));
-    candidates &= candidates - 1;
-    if (pos < next) continue;
-    if (m <= 2 || std::memcmp(p + pos + 1, find + 1, m - 2) == 0) {
-      ++count;
-      next = pos + m;
-    }
-  }
-}
-
-}  // namespace
 
 ZUL_AVX2 std::uint64_t count_byte_avx2(const std::uint8_t* p, std::size_t n,
                                        std::uint8_t b) noexcept {
@@ -149,7 +131,7 @@ ZUL_AVX2 std::uint64_t count_pattern_avx2(const std::uint8_t* p, std::size_t n,
     const __m256i z = _mm256_loadu_si256(reinterpret_cast<const __m256i*>(p + i + m - 1));
     const __m256i both = _mm256_and_si256(_mm256_cmpeq_epi8(a, first), _mm256_cmpeq_epi8(z, last));
     const auto candidates = static_cast<std::uint32_t>(_mm256_movemask_epi8(both));
-    if (candidates != 0) check_candidates(candidates, i, p, find, m, next, count);
+    if (candidates != 0) check_candidates(candidates, 0, i, p, find, m, next, count);
   }
   return count + count_pattern_from(p, n, find, m, i, next);
 }
@@ -165,7 +147,7 @@ ZUL_AVX512 std::uint64_t count_pattern_avx512(const std::uint8_t* p, std::size_t
     const __mmask64 a = _mm512_cmpeq_epi8_mask(_mm512_loadu_si512(p + i), first);
     const __mmask64 candidates =
         _mm512_mask_cmpeq_epi8_mask(a, _mm512_loadu_si512(p + i + m - 1), last);
-    if (candidates != 0) check_candidates(candidates, i, p, find, m, next, count);
+    if (candidates != 0) check_candidates(candidates, 0, i, p, find, m, next, count);
   }
   return count + count_pattern_from(p, n, find, m, i, next);
 }
