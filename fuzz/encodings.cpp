@@ -96,7 +96,9 @@ extern "C" int LLVMFuzzerTestOneInput(const std::uint8_t* data, std::size_t size
       break;
     }
     default:
-      (void)enc::decode_mysql(in);
+      for (const zul::simd::isa level : zul::simd::supported_isas()) {
+        check(enc::decode_mysql(in, level) == zul::reference::decode_mysql_reference(in));
+      }
       for (const zul::simd::isa level : zul::simd::supported_isas()) {
         const std::string_view with = options & 1 ? "?" : "";
         check(enc::remove_html_tags(in, with, zul::kMaxResultBytes, level) ==
