@@ -23,6 +23,8 @@ const simd::family_tables<tag_kernels>& tag_tables() noexcept {
   static const simd::family_tables<tag_kernels> tables = [] {
     simd::family_tables<tag_kernels> t{&kNone};
 #if defined(__x86_64__) || defined(_M_X64)
+    t.sse2 = &kStripTagsSse2;
+    t.avx2 = &kStripTagsAvx2;
     if (simd::has_avx512_vbmi2()) t.avx512 = &kVbmi2;
 #endif
     return t;

@@ -1,9 +1,9 @@
 // Block kernels of tag removal without a replacement: whole blocks of bytes
 // are filtered at once (bytes at depth 0 kept, brackets and zero bytes
 // dropped) and the byte-at-a-time loop of html_tags.cpp finishes the tail.
-// Only AVX-512 with VBMI and VBMI2 has one (a byte permute for the depth's
-// running sum, a compress for the kept bytes); other levels search for the
-// next bracket instead.
+// AVX-512 with VBMI and VBMI2 compresses the kept bytes of any block (a
+// byte permute gives the depth's running sum); SSE2 and AVX2 copy the
+// runs between brackets.
 #pragma once
 
 #include <cstddef>
@@ -25,6 +25,7 @@ struct tag_kernels {
 
 const simd::family_tables<tag_kernels>& tag_tables() noexcept;
 
+extern const tag_kernels kStripTagsSse2, kStripTagsAvx2;
 std::size_t strip_tags_avx512_vbmi2(const std::uint8_t* in, std::size_t n, std::uint8_t* out,
                                     std::int64_t* depth, std::size_t* written) noexcept;
 

@@ -40,11 +40,13 @@ out_buffer decode_mysql(std::string_view in, simd::isa level) {
     out.commit(written);
   }
   while (i < n) {
-    const void* slash = std::memchr(p + i, '\\', n - i);
-    const std::size_t at =
-        slash ? static_cast<std::size_t>(static_cast<const char*>(slash) - p) : n;
-    out.put(p + i, at - i);
-    i = at;
+    if (p[i] != '\\') {  // escapes in a row skip the search
+      const void* slash = std::memchr(p + i, '\\', n - i);
+      const std::size_t at =
+          slash ? static_cast<std::size_t>(static_cast<const char*>(slash) - p) : n;
+      out.put(p + i, at - i);
+      i = at;
+    }
     if (i + 1 >= n) {  // no backslash, or a final one: kept as it is
       out.put(p + i, n - i);
       break;
