@@ -84,6 +84,12 @@ ZUL_AVX512_VBMI2 std::size_t encode_avx512_vbmi2(const std::uint16_t* in, std::s
       low = _mm512_mask_mov_epi8(low, held, _mm512_permutex2var_epi8(bytes_a, even_bytes, bytes_b));
       keep |= held;
     }
+    if (keep == ~std::uint64_t{0}) {  // all held (typical Windows-1252 text)
+      _mm512_storeu_si512(out + o, low);
+      i += 64;
+      o += 64;
+      continue;
+    }
     const __m512i packed = _mm512_maskz_compress_epi8(keep, low);
     const auto count = static_cast<std::size_t>(__builtin_popcountll(keep));
     if (left >= 64) {
