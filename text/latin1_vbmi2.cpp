@@ -7,7 +7,8 @@
 //   mapped    = special units that the set holds: a perfect hash of the
 //               unit (a multiply and a shift) picks a slot of a 64-entry
 //               table (16-bit permutes of two registers), whose unit must
-//               equal it and whose byte it takes;
+//               equal it and whose byte it takes (one half of the block
+//               only, when the other has no such unit);
 // a block without special units is stored whole; otherwise the low bytes,
 // with the mapped ones patched in, are compressed over the dropped units
 // (VPCOMPRESSB) and stored whole. The output never passes the input, so the
@@ -78,10 +79,23 @@ ZUL_AVX512_VBMI2 std::size_t encode_avx512_vbmi2(const std::uint16_t* in, std::s
     }
     std::uint64_t keep = ~special & lanes;
     if (has_high && wide != 0) {
-      __m512i bytes_a, bytes_b;
-      const std::uint64_t held =
-          (map_high(h, a, &bytes_a) | std::uint64_t{map_high(h, b, &bytes_b)} << 32) & wide;
-      low = _mm512_mask_mov_epi8(low, held, _mm512_permutex2var_epi8(bytes_a, even_bytes, bytes_b));
+      std::uint64_t held;
+      if (static_cast<std::uint32_t>(wide) != 0 && (wide >> 32) != 0) {
+        __m512i bytes_a, bytes_b;
+        held = map_high(h, a, &bytes_a) | std::uint64_t{map_high(h, b, &bytes_b)} << 32;
+        low = _mm512_mask_mov_epi8(low, held & wide,
+                                   _mm512_permutex2var_epi8(bytes_a, even_bytes, bytes_b));
+      } else {
+        // Units from 0x100 up in one half only (typical text): hash that
+        // half, its bytes copied to both halves of the block.
+        const unsigned shift = static_cast<std::uint32_t>(wide) == 0 ? 32 : 0;
+        const __m512i half = _mm512_mask_mov_epi16(a, shift != 0 ? ~__mmask32{0} : 0, b);
+        __m512i bytes;
+        held = std::uint64_t{map_high(h, half, &bytes)} << shift;
+        low = _mm512_mask_mov_epi8(low, held & wide,
+                                   _mm512_permutex2var_epi8(bytes, even_bytes, bytes));
+      }
+      held &= wide;
       keep |= held;
     }
     if (keep == ~std::uint64_t{0}) {  // all held (typical Windows-1252 text)
