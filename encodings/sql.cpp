@@ -3,7 +3,9 @@
 // candidate byte to the next (a quote, or a "t" or "f" that starts a word:
 // encodings/sql_kernels.h) and, inside quotes, to the closing quote; the
 // bytes in between are copied whole. A word byte is anything but a
-// separator, quotes included.
+// separator, quotes included. Unescaping runs the level's block kernel
+// (encodings/sql_unescape_vbmi2.cpp) where there is one; memchr finds the
+// next backslash for the rest.
 #include "encodings/sql.h"
 
 #include <array>

@@ -1,11 +1,13 @@
 // ISO 8859-1 / Windows-1252 conversion cores. Both directions run the
-// machine's block kernels (latin1_x86.cpp) straight into the locked handle,
-// sized once, and finish the tail with the scalar level here: one table
-// look-up per byte when decoding; when encoding, ASCII words and then a
-// reverse map derived at compile time from the same table (lowest byte
-// first, as a search from index 0 would find, two look-ups per unit);
-// tests compare it with a plain table search
-// (tests/reference/latin1_reference.h).
+// machine's block kernels (latin1_x86.cpp; the AVX-512 encoder with VBMI2
+// in latin1_vbmi2.cpp) straight into the locked handle, sized once, and
+// finish the tail with the scalar level here: one table look-up per byte
+// when decoding; when encoding, ASCII words and then a reverse map derived
+// at compile time from the same table (lowest byte first, as a search from
+// index 0 would find, two look-ups per unit); tests compare it with a plain
+// table search (tests/reference/latin1_reference.h). The vector kernels find
+// the units from 0x100 up that a set holds through a perfect hash derived
+// here too.
 #include "text/latin1.h"
 
 #include <algorithm>
