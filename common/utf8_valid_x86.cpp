@@ -135,36 +135,54 @@ ZUL_AVX2 inline __m256i load_avx2(const lane_table& t) {
   return _mm256_load_si256(reinterpret_cast<const __m256i*>(t.bytes));
 }
 
+// The lookup tables and constants of the AVX2 check, loaded once per call.
+struct avx2_consts {
+  __m256i byte1_high, byte1_low, byte2_high, nibble, open_at_end;
+};
+
+// Error bits for the 32 bytes v, given the bytes 1, 2 and 3 before each.
+ZUL_AVX2 inline __m256i errors_avx2(const avx2_consts& k, __m256i v, __m256i prev1, __m256i prev2,
+                                    __m256i prev3) {
+  const __m256i special = _mm256_and_si256(
+      _mm256_and_si256(_mm256_shuffle_epi8(k.byte1_high,
+                                           _mm256_and_si256(_mm256_srli_epi16(prev1, 4), k.nibble)),
+                       _mm256_shuffle_epi8(k.byte1_low, _mm256_and_si256(prev1, k.nibble))),
+      _mm256_shuffle_epi8(k.byte2_high, _mm256_and_si256(_mm256_srli_epi16(v, 4), k.nibble)));
+  const __m256i third = _mm256_subs_epu8(prev2, _mm256_set1_epi8(0x60));
+  const __m256i fourth = _mm256_subs_epu8(prev3, _mm256_set1_epi8(0x70));
+  const __m256i must23 =
+      _mm256_and_si256(_mm256_or_si256(third, fourth), _mm256_set1_epi8(static_cast<char>(0x80)));
+  return _mm256_xor_si256(must23, special);
+}
+
 ZUL_AVX2 std::size_t copy_valid_avx2(const std::uint8_t* in, std::size_t n,
                                      std::uint8_t* out) noexcept {
-  const __m256i byte1_high = load_avx2(kByte1HighX4);
-  const __m256i byte1_low = load_avx2(kByte1LowX4);
-  const __m256i byte2_high = load_avx2(kByte2HighX4);
-  const __m256i nibble = _mm256_set1_epi8(0x0F);
-  const __m256i open_at_end = load_avx2(kOpenAtEnd32);
-  __m256i prev = _mm256_setzero_si256();
-  __m256i prev_open = _mm256_setzero_si256();
-  std::size_t i = 0;
+  const avx2_consts k{load_avx2(kByte1HighX4), load_avx2(kByte1LowX4), load_avx2(kByte2HighX4),
+                      _mm256_set1_epi8(0x0F), load_avx2(kOpenAtEnd32)};
+  if (n < 32) return 0;
+  // The first block: the bytes before it count as ASCII.
+  __m256i v = _mm256_loadu_si256(reinterpret_cast<const __m256i*>(in));
+  const __m256i zero = _mm256_setzero_si256();
+  __m256i error =
+      errors_avx2(k, v, prev_avx2<1>(v, zero), prev_avx2<2>(v, zero), prev_avx2<3>(v, zero));
+  __m256i open = _mm256_subs_epu8(v, k.open_at_end);
+  if (!_mm256_testz_si256(error, error)) return 0;
+  if (out != nullptr) _mm256_storeu_si256(reinterpret_cast<__m256i*>(out), v);
+  // Later blocks read the bytes before them again from memory: unaligned
+  // loads are cheaper than the lane shuffles that would rebuild them.
+  std::size_t i = 32;
   for (; i + 32 <= n; i += 32) {
-    const __m256i v = _mm256_loadu_si256(reinterpret_cast<const __m256i*>(in + i));
-    __m256i error = prev_open;
+    v = _mm256_loadu_si256(reinterpret_cast<const __m256i*>(in + i));
+    error = open;
     if (_mm256_movemask_epi8(v) != 0) {
-      const __m256i prev1 = prev_avx2<1>(v, prev);
-      const __m256i special = _mm256_and_si256(
-          _mm256_and_si256(_mm256_shuffle_epi8(
-                               byte1_high, _mm256_and_si256(_mm256_srli_epi16(prev1, 4), nibble)),
-                           _mm256_shuffle_epi8(byte1_low, _mm256_and_si256(prev1, nibble))),
-          _mm256_shuffle_epi8(byte2_high, _mm256_and_si256(_mm256_srli_epi16(v, 4), nibble)));
-      const __m256i third = _mm256_subs_epu8(prev_avx2<2>(v, prev), _mm256_set1_epi8(0x60));
-      const __m256i fourth = _mm256_subs_epu8(prev_avx2<3>(v, prev), _mm256_set1_epi8(0x70));
-      const __m256i must23 = _mm256_and_si256(_mm256_or_si256(third, fourth),
-                                              _mm256_set1_epi8(static_cast<char>(0x80)));
-      error = _mm256_xor_si256(must23, special);
-      prev_open = _mm256_subs_epu8(v, open_at_end);
+      // The check covers a sequence left open by the block before.
+      error = errors_avx2(k, v, _mm256_loadu_si256(reinterpret_cast<const __m256i*>(in + i - 1)),
+                          _mm256_loadu_si256(reinterpret_cast<const __m256i*>(in + i - 2)),
+                          _mm256_loadu_si256(reinterpret_cast<const __m256i*>(in + i - 3)));
+      open = _mm256_subs_epu8(v, k.open_at_end);
     }
     if (!_mm256_testz_si256(error, error)) break;
     if (out != nullptr) _mm256_storeu_si256(reinterpret_cast<__m256i*>(out + i), v);
-    prev = v;
   }
   return utf8_boundary_before(in, i);
 }
@@ -180,36 +198,55 @@ ZUL_AVX512 inline __m512i prev_avx512(__m512i v, __m512i prev) {
   return _mm512_alignr_epi8(v, _mm512_permutex2var_epi32(v, lanes, prev), 16 - N);
 }
 
+// The lookup tables and constants of the AVX-512 check, loaded once per call.
+struct avx512_consts {
+  __m512i byte1_high, byte1_low, byte2_high, nibble, open_at_end;
+};
+
+// Error bits for the 64 bytes v, given the bytes 1, 2 and 3 before each.
+ZUL_AVX512 inline __m512i errors_avx512(const avx512_consts& k, __m512i v, __m512i prev1,
+                                        __m512i prev2, __m512i prev3) {
+  const __m512i special = _mm512_ternarylogic_epi32(
+      _mm512_shuffle_epi8(k.byte1_high, _mm512_and_si512(_mm512_srli_epi16(prev1, 4), k.nibble)),
+      _mm512_shuffle_epi8(k.byte1_low, _mm512_and_si512(prev1, k.nibble)),
+      _mm512_shuffle_epi8(k.byte2_high, _mm512_and_si512(_mm512_srli_epi16(v, 4), k.nibble)),
+      0x80);  // a & b & c
+  const __m512i third = _mm512_subs_epu8(prev2, _mm512_set1_epi8(0x60));
+  const __m512i fourth = _mm512_subs_epu8(prev3, _mm512_set1_epi8(0x70));
+  // (third | fourth) & 0x80: the bytes that must be continuations.
+  const __m512i must23 =
+      _mm512_ternarylogic_epi32(third, fourth, _mm512_set1_epi8(static_cast<char>(0x80)), 0xA8);
+  return _mm512_xor_si512(must23, special);
+}
+
 ZUL_AVX512 std::size_t copy_valid_avx512(const std::uint8_t* in, std::size_t n,
                                          std::uint8_t* out) noexcept {
-  const __m512i byte1_high = _mm512_load_si512(kByte1HighX4.bytes);
-  const __m512i byte1_low = _mm512_load_si512(kByte1LowX4.bytes);
-  const __m512i byte2_high = _mm512_load_si512(kByte2HighX4.bytes);
-  const __m512i nibble = _mm512_set1_epi8(0x0F);
-  const __m512i open_at_end = _mm512_load_si512(kOpenAtEnd64.bytes);
-  __m512i prev = _mm512_setzero_si512();
-  __m512i prev_open = _mm512_setzero_si512();
-  std::size_t i = 0;
+  const avx512_consts k{_mm512_load_si512(kByte1HighX4.bytes), _mm512_load_si512(kByte1LowX4.bytes),
+                        _mm512_load_si512(kByte2HighX4.bytes), _mm512_set1_epi8(0x0F),
+                        _mm512_load_si512(kOpenAtEnd64.bytes)};
+  if (n < 64) return 0;
+  // The first block: the bytes before it count as ASCII.
+  __m512i v = _mm512_loadu_si512(in);
+  const __m512i zero = _mm512_setzero_si512();
+  __m512i error = errors_avx512(k, v, prev_avx512<1>(v, zero), prev_avx512<2>(v, zero),
+                                prev_avx512<3>(v, zero));
+  __m512i open = _mm512_subs_epu8(v, k.open_at_end);
+  if (_mm512_test_epi8_mask(error, error) != 0) return 0;
+  if (out != nullptr) _mm512_storeu_si512(out, v);
+  // Later blocks read the bytes before them again from memory: unaligned
+  // loads are cheaper than the lane shuffles that would rebuild them.
+  std::size_t i = 64;
   for (; i + 64 <= n; i += 64) {
-    const __m512i v = _mm512_loadu_si512(in + i);
-    __m512i error = prev_open;
+    v = _mm512_loadu_si512(in + i);
+    error = open;
     if (_mm512_movepi8_mask(v) != 0) {
-      const __m512i prev1 = prev_avx512<1>(v, prev);
-      const __m512i special = _mm512_ternarylogic_epi32(
-          _mm512_shuffle_epi8(byte1_high, _mm512_and_si512(_mm512_srli_epi16(prev1, 4), nibble)),
-          _mm512_shuffle_epi8(byte1_low, _mm512_and_si512(prev1, nibble)),
-          _mm512_shuffle_epi8(byte2_high, _mm512_and_si512(_mm512_srli_epi16(v, 4), nibble)),
-          0x80);  // a & b & c
-      const __m512i third = _mm512_subs_epu8(prev_avx512<2>(v, prev), _mm512_set1_epi8(0x60));
-      const __m512i fourth = _mm512_subs_epu8(prev_avx512<3>(v, prev), _mm512_set1_epi8(0x70));
-      const __m512i must23 = _mm512_and_si512(_mm512_or_si512(third, fourth),
-                                              _mm512_set1_epi8(static_cast<char>(0x80)));
-      error = _mm512_xor_si512(must23, special);
-      prev_open = _mm512_subs_epu8(v, open_at_end);
+      // The check covers a sequence left open by the block before.
+      error = errors_avx512(k, v, _mm512_loadu_si512(in + i - 1), _mm512_loadu_si512(in + i - 2),
+                            _mm512_loadu_si512(in + i - 3));
+      open = _mm512_subs_epu8(v, k.open_at_end);
     }
     if (_mm512_test_epi8_mask(error, error) != 0) break;
     if (out != nullptr) _mm512_storeu_si512(out + i, v);
-    prev = v;
   }
   return utf8_boundary_before(in, i);
 }
