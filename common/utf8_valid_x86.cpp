@@ -251,11 +251,145 @@ ZUL_AVX512 std::size_t copy_valid_avx512(const std::uint8_t* in, std::size_t n,
   return utf8_boundary_before(in, i);
 }
 
+// ---- Byte by byte: which bytes lie inside a well-formed sequence ----
+//
+// The masks of one block, from its bytes and the next three after each:
+// sequence starts by length, from plain comparisons of the rules of each
+// first byte. A byte is kept when a sequence starting at it or up to three
+// bytes before it covers it.
+struct start_masks {
+  std::uint64_t ascii, start2, start3, start4;
+};
+
+// Keep masks from the start masks of consecutive blocks; carry holds the
+// starts of the block before, shifted out.
+inline std::uint64_t keep_from(const start_masks& s, const start_masks& before) {
+  const std::uint64_t any = s.start2 | s.start3 | s.start4;
+  const std::uint64_t any_before = before.start2 | before.start3 | before.start4;
+  const std::uint64_t long3 = s.start3 | s.start4;
+  const std::uint64_t long3_before = before.start3 | before.start4;
+  return s.ascii | any | (any << 1 | any_before >> 63) | (long3 << 2 | long3_before >> 62) |
+         (s.start4 << 3 | before.start4 >> 61);
+}
+
+// Bytes past the block that a sequence starting in its last three covers.
+inline std::size_t overhang(const start_masks& last) {
+  const auto at = [](std::uint64_t m, int k) { return ((m >> k) & 1) != 0; };
+  if (at(last.start4, 63)) return 3;
+  if (at(last.start3, 63) || at(last.start4, 62)) return 2;
+  if (at(last.start2, 63) || at(last.start3, 62) || at(last.start4, 61)) return 1;
+  return 0;
+}
+
+// AVX2: 32 bytes at a time; unsigned comparisons through min and max.
+ZUL_AVX2 inline std::uint32_t mask_avx2(__m256i m) {
+  return static_cast<std::uint32_t>(_mm256_movemask_epi8(m));
+}
+
+ZUL_AVX2 inline __m256i splat_avx2(int b) { return _mm256_set1_epi8(static_cast<char>(b)); }
+// FF where x is 80..BF.
+ZUL_AVX2 inline __m256i is_cont_avx2(__m256i x) {
+  return _mm256_cmpeq_epi8(_mm256_and_si256(x, splat_avx2(0xC0)), splat_avx2(0x80));
+}
+// FF where x <= b and where x >= b, unsigned.
+ZUL_AVX2 inline __m256i at_most_avx2(__m256i x, int b) {
+  return _mm256_cmpeq_epi8(_mm256_min_epu8(x, splat_avx2(b)), x);
+}
+ZUL_AVX2 inline __m256i at_least_avx2(__m256i x, int b) {
+  return _mm256_cmpeq_epi8(_mm256_max_epu8(x, splat_avx2(b)), x);
+}
+
+ZUL_AVX2 inline __m256i load(const std::uint8_t* q) {
+  return _mm256_loadu_si256(reinterpret_cast<const __m256i*>(q));
+}
+
+ZUL_AVX2 start_masks starts_avx2_half(const std::uint8_t* in) {
+  const __m256i c = load(in);
+  const __m256i d = load(in + 1);
+  const __m256i cont1 = is_cont_avx2(d);
+  const __m256i cont2 = is_cont_avx2(load(in + 2));
+  const __m256i cont3 = is_cont_avx2(load(in + 3));
+  const __m256i is_e0 = _mm256_cmpeq_epi8(c, splat_avx2(0xE0));
+  const __m256i is_ed = _mm256_cmpeq_epi8(c, splat_avx2(0xED));
+  const __m256i is_f0 = _mm256_cmpeq_epi8(c, splat_avx2(0xF0));
+  const __m256i is_f4 = _mm256_cmpeq_epi8(c, splat_avx2(0xF4));
+  // Second bytes narrower than 80..BF: E0 A0.., ED ..9F, F0 90.., F4 ..8F.
+  const __m256i narrow =
+      _mm256_or_si256(_mm256_or_si256(_mm256_andnot_si256(at_least_avx2(d, 0xA0), is_e0),
+                                      _mm256_andnot_si256(at_most_avx2(d, 0x9F), is_ed)),
+                      _mm256_or_si256(_mm256_andnot_si256(at_least_avx2(d, 0x90), is_f0),
+                                      _mm256_andnot_si256(at_most_avx2(d, 0x8F), is_f4)));
+  const __m256i second = _mm256_andnot_si256(narrow, cont1);
+  const __m256i second2 = _mm256_and_si256(second, cont2);
+  const __m256i lead2 = at_most_avx2(_mm256_sub_epi8(c, splat_avx2(0xC2)), 0x1D);
+  const __m256i lead3 = at_most_avx2(_mm256_sub_epi8(c, splat_avx2(0xE0)), 0x0F);
+  const __m256i lead4 = at_most_avx2(_mm256_sub_epi8(c, splat_avx2(0xF0)), 0x04);
+  return {~mask_avx2(c) & 0xFFFFFFFFull, mask_avx2(_mm256_and_si256(lead2, second)),
+          mask_avx2(_mm256_and_si256(lead3, second2)),
+          mask_avx2(_mm256_and_si256(lead4, _mm256_and_si256(second2, cont3)))};
+}
+
+ZUL_AVX2 std::size_t keep_masks_avx2(const std::uint8_t* in, std::size_t blocks,
+                                     std::uint64_t* keep) noexcept {
+  start_masks before{};
+  for (std::size_t b = 0; b < blocks; ++b) {
+    const start_masks low = starts_avx2_half(in + 64 * b);
+    const start_masks high = starts_avx2_half(in + 64 * b + 32);
+    const start_masks s{low.ascii | high.ascii << 32, low.start2 | high.start2 << 32,
+                        low.start3 | high.start3 << 32, low.start4 | high.start4 << 32};
+    keep[b] = keep_from(s, before);
+    before = s;
+  }
+  return overhang(before);
+}
+
+ZUL_AVX512 inline __m512i splat_avx512(int b) { return _mm512_set1_epi8(static_cast<char>(b)); }
+// Bits set where x is 80..BF.
+ZUL_AVX512 inline __mmask64 is_cont_avx512(__m512i x) {
+  return _mm512_cmpeq_epi8_mask(_mm512_and_si512(x, splat_avx512(0xC0)), splat_avx512(0x80));
+}
+// Bits set where x - low is at most span, unsigned: x in low..low + span.
+ZUL_AVX512 inline __mmask64 in_range_avx512(__m512i x, int low, int span) {
+  return _mm512_cmple_epu8_mask(_mm512_sub_epi8(x, splat_avx512(low)), splat_avx512(span));
+}
+
+ZUL_AVX512 start_masks starts_avx512(const std::uint8_t* in) {
+  const __m512i c = _mm512_loadu_si512(in);
+  const __m512i d = _mm512_loadu_si512(in + 1);
+  const __mmask64 cont1 = is_cont_avx512(d);
+  const __mmask64 cont2 = is_cont_avx512(_mm512_loadu_si512(in + 2));
+  const __mmask64 cont3 = is_cont_avx512(_mm512_loadu_si512(in + 3));
+  // Second bytes narrower than 80..BF: E0 A0.., ED ..9F, F0 90.., F4 ..8F.
+  const __mmask64 narrow = (_mm512_cmpeq_epi8_mask(c, splat_avx512(0xE0)) &
+                            _mm512_cmplt_epu8_mask(d, splat_avx512(0xA0))) |
+                           (_mm512_cmpeq_epi8_mask(c, splat_avx512(0xED)) &
+                            _mm512_cmpgt_epu8_mask(d, splat_avx512(0x9F))) |
+                           (_mm512_cmpeq_epi8_mask(c, splat_avx512(0xF0)) &
+                            _mm512_cmplt_epu8_mask(d, splat_avx512(0x90))) |
+                           (_mm512_cmpeq_epi8_mask(c, splat_avx512(0xF4)) &
+                            _mm512_cmpgt_epu8_mask(d, splat_avx512(0x8F)));
+  const std::uint64_t second = cont1 & ~narrow;
+  return {~static_cast<std::uint64_t>(_mm512_movepi8_mask(c)),
+          in_range_avx512(c, 0xC2, 0x1D) & second, in_range_avx512(c, 0xE0, 0x0F) & second & cont2,
+          in_range_avx512(c, 0xF0, 0x04) & second & cont2 & cont3};
+}
+
+ZUL_AVX512 std::size_t keep_masks_avx512(const std::uint8_t* in, std::size_t blocks,
+                                         std::uint64_t* keep) noexcept {
+  start_masks before{};
+  for (std::size_t b = 0; b < blocks; ++b) {
+    const start_masks s = starts_avx512(in + 64 * b);
+    keep[b] = keep_from(s, before);
+    before = s;
+  }
+  return overhang(before);
+}
+
 }  // namespace
 
-const utf8_kernels kUtf8Sse2{copy_valid_sse2};
-const utf8_kernels kUtf8Avx2{copy_valid_avx2};
-const utf8_kernels kUtf8Avx512{copy_valid_avx512};
+const utf8_kernels kUtf8Sse2{copy_valid_sse2, nullptr};
+const utf8_kernels kUtf8Avx2{copy_valid_avx2, keep_masks_avx2};
+const utf8_kernels kUtf8Avx512{copy_valid_avx512, keep_masks_avx512};
 
 }  // namespace zul::simd::detail
 
