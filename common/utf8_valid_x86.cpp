@@ -155,6 +155,16 @@ ZUL_AVX2 inline __m256i errors_avx2(const avx2_consts& k, __m256i v, __m256i pre
   return _mm256_xor_si256(must23, special);
 }
 
+ZUL_AVX2 inline __m256i load(const std::uint8_t* q) {
+  return _mm256_loadu_si256(reinterpret_cast<const __m256i*>(q));
+}
+
+// Error bits for the 32 bytes v at offset at of in (at >= 3).
+ZUL_AVX2 inline __m256i check_at_avx2(const avx2_consts& k, const std::uint8_t* in, __m256i v,
+                                      std::size_t at) {
+  return errors_avx2(k, v, load(in + at - 1), load(in + at - 2), load(in + at - 3));
+}
+
 ZUL_AVX2 std::size_t copy_valid_avx2(const std::uint8_t* in, std::size_t n,
                                      std::uint8_t* out) noexcept {
   const avx2_consts k{load_avx2(kByte1HighX4), load_avx2(kByte1LowX4), load_avx2(kByte2HighX4),
@@ -169,16 +179,16 @@ ZUL_AVX2 std::size_t copy_valid_avx2(const std::uint8_t* in, std::size_t n,
   if (!_mm256_testz_si256(error, error)) return 0;
   if (out != nullptr) _mm256_storeu_si256(reinterpret_cast<__m256i*>(out), v);
   // Later blocks read the bytes before them again from memory: unaligned
-  // loads are cheaper than the lane shuffles that would rebuild them.
+  // loads are cheaper than the lane shuffles that would rebuild them. Pairs
+  // of blocks first, with one test for both; the single blocks below find
+  // the faulty one of a pair, and take the last block.
   std::size_t i = 32;
   for (; i + 32 <= n; i += 32) {
     v = _mm256_loadu_si256(reinterpret_cast<const __m256i*>(in + i));
     error = open;
     if (_mm256_movemask_epi8(v) != 0) {
       // The check covers a sequence left open by the block before.
-      error = errors_avx2(k, v, _mm256_loadu_si256(reinterpret_cast<const __m256i*>(in + i - 1)),
-                          _mm256_loadu_si256(reinterpret_cast<const __m256i*>(in + i - 2)),
-                          _mm256_loadu_si256(reinterpret_cast<const __m256i*>(in + i - 3)));
+      error = check_at_avx2(k, in, v, i);
       open = _mm256_subs_epu8(v, k.open_at_end);
     }
     if (!_mm256_testz_si256(error, error)) break;
@@ -219,6 +229,13 @@ ZUL_AVX512 inline __m512i errors_avx512(const avx512_consts& k, __m512i v, __m51
   return _mm512_xor_si512(must23, special);
 }
 
+// Error bits for the 64 bytes v at offset at of in (at >= 3).
+ZUL_AVX512 inline __m512i check_at_avx512(const avx512_consts& k, const std::uint8_t* in, __m512i v,
+                                          std::size_t at) {
+  return errors_avx512(k, v, _mm512_loadu_si512(in + at - 1), _mm512_loadu_si512(in + at - 2),
+                       _mm512_loadu_si512(in + at - 3));
+}
+
 ZUL_AVX512 std::size_t copy_valid_avx512(const std::uint8_t* in, std::size_t n,
                                          std::uint8_t* out) noexcept {
   const avx512_consts k{_mm512_load_si512(kByte1HighX4.bytes), _mm512_load_si512(kByte1LowX4.bytes),
@@ -234,15 +251,31 @@ ZUL_AVX512 std::size_t copy_valid_avx512(const std::uint8_t* in, std::size_t n,
   if (_mm512_test_epi8_mask(error, error) != 0) return 0;
   if (out != nullptr) _mm512_storeu_si512(out, v);
   // Later blocks read the bytes before them again from memory: unaligned
-  // loads are cheaper than the lane shuffles that would rebuild them.
+  // loads are cheaper than the lane shuffles that would rebuild them. Pairs
+  // of blocks first, with one test for both; the single blocks below find
+  // the faulty one of a pair, and take the last block.
   std::size_t i = 64;
+  for (; i + 128 <= n; i += 128) {
+    const __m512i v0 = _mm512_loadu_si512(in + i);
+    const __m512i v1 = _mm512_loadu_si512(in + i + 64);
+    if (_mm512_movepi8_mask(_mm512_or_si512(v0, v1)) != 0) {
+      error = _mm512_or_si512(check_at_avx512(k, in, v0, i), check_at_avx512(k, in, v1, i + 64));
+      if (_mm512_test_epi8_mask(error, error) != 0) break;
+      open = _mm512_subs_epu8(v1, k.open_at_end);
+    } else if (_mm512_test_epi8_mask(open, open) != 0) {
+      break;
+    }
+    if (out != nullptr) {
+      _mm512_storeu_si512(out + i, v0);
+      _mm512_storeu_si512(out + i + 64, v1);
+    }
+  }
   for (; i + 64 <= n; i += 64) {
     v = _mm512_loadu_si512(in + i);
     error = open;
     if (_mm512_movepi8_mask(v) != 0) {
       // The check covers a sequence left open by the block before.
-      error = errors_avx512(k, v, _mm512_loadu_si512(in + i - 1), _mm512_loadu_si512(in + i - 2),
-                            _mm512_loadu_si512(in + i - 3));
+      error = check_at_avx512(k, in, v, i);
       open = _mm512_subs_epu8(v, k.open_at_end);
     }
     if (_mm512_test_epi8_mask(error, error) != 0) break;
@@ -297,10 +330,6 @@ ZUL_AVX2 inline __m256i at_most_avx2(__m256i x, int b) {
 }
 ZUL_AVX2 inline __m256i at_least_avx2(__m256i x, int b) {
   return _mm256_cmpeq_epi8(_mm256_max_epu8(x, splat_avx2(b)), x);
-}
-
-ZUL_AVX2 inline __m256i load(const std::uint8_t* q) {
-  return _mm256_loadu_si256(reinterpret_cast<const __m256i*>(q));
 }
 
 ZUL_AVX2 start_masks starts_avx2_half(const std::uint8_t* in) {
@@ -387,9 +416,9 @@ ZUL_AVX512 std::size_t keep_masks_avx512(const std::uint8_t* in, std::size_t blo
 
 }  // namespace
 
-const utf8_kernels kUtf8Sse2{copy_valid_sse2, nullptr};
-const utf8_kernels kUtf8Avx2{copy_valid_avx2, keep_masks_avx2};
-const utf8_kernels kUtf8Avx512{copy_valid_avx512, keep_masks_avx512};
+const utf8_kernels kUtf8Sse2{copy_valid_sse2, nullptr, 16};
+const utf8_kernels kUtf8Avx2{copy_valid_avx2, keep_masks_avx2, 32};
+const utf8_kernels kUtf8Avx512{copy_valid_avx512, keep_masks_avx512, 64};
 
 }  // namespace zul::simd::detail
 

@@ -124,11 +124,14 @@ out_buffer repair_utf8(bytes_view bytes, std::string_view placeholder, std::uint
       if (got == 0) kernel_from = i + kScalarStretch;
     }
     const bool stretch = i < kernel_from;
-    if (stretch && dense_blocks != 0 && n - i >= kBlock + 3) {
-      // Whole blocks of the stretch by keep masks; the sequence that the
-      // last one leaves open is copied too, so i stays on a boundary.
+    if (dense_blocks != 0 && (stretch || kernels.block == kBlock) && n - i >= kBlock + 3) {
+      // Whole blocks by keep masks: those of the stretch, or the one the
+      // kernel stopped in when its blocks are as long (a shorter block's
+      // fault costs less by the byte rules). The sequence that the last one
+      // leaves open is copied too, so i stays on a boundary.
       std::size_t blocks = (n - i - 3) / kBlock;
-      if (blocks > dense_blocks) blocks = dense_blocks;
+      const std::size_t most = stretch ? dense_blocks : 1;
+      if (blocks > most) blocks = most;
       std::uint64_t keep[kDenseBlocks];
       const std::size_t overhang = kernels.keep_masks(p + i, blocks, keep);
       if (!out.ensure(blocks * dense_room)) return out.discard();
