@@ -10,6 +10,7 @@
 #include "text/utf8_repair.h"
 
 #include <array>
+#include <bit>
 #include <cstring>
 
 namespace zul::text {
@@ -35,12 +36,11 @@ constexpr std::array<std::uint64_t, 256> kSpread = [] {
 
 // Writes blocks of 64 bytes from in with every byte whose keep bit is clear
 // replaced by placeholder; returns the new end of the output. Room for
-// 64 * max(placeholder size, 1) + 32 bytes per block is needed. Keep masks
-// exist on little-endian x86-64 only, where the words below are in order.
+// 64 * max(placeholder size, 1) + 32 bytes per block is needed.
 std::uint8_t* write_kept(const std::uint8_t* in, const std::uint64_t* keep, std::size_t blocks,
                          std::string_view placeholder, std::uint8_t* o) {
   const std::size_t ph_size = placeholder.size();
-  if (ph_size == 1) {
+  if (ph_size == 1 && std::endian::native == std::endian::little) {
     // One byte for one byte: a select per word of eight.
     const std::uint64_t ph8 = 0x0101010101010101ull * static_cast<std::uint8_t>(placeholder[0]);
     for (std::size_t b = 0; b < blocks; ++b) {
@@ -137,7 +137,7 @@ out_buffer repair_utf8(bytes_view bytes, std::string_view placeholder, std::uint
       if (!out.ensure(blocks * dense_room)) return out.discard();
       std::uint8_t* o = write_kept(p + i, keep, blocks, placeholder, out.tail());
       i += blocks * kBlock;
-      std::memcpy(o, p + i, 4);
+      std::memcpy(o, p + i, 3);  // at least 3 bytes follow the blocks
       out.commit(static_cast<std::size_t>(o - out.tail()) + overhang);
       i += overhang;
       continue;
