@@ -8,6 +8,9 @@
 // exactly the expected continuations pass. A block of ASCII is checked only
 // for a sequence that the previous block left open. The SSE2 level lacks
 // byte shuffles and copies ASCII blocks only.
+// For text dense with faults, keep masks judge every byte on its own: it is
+// kept when a well-formed sequence (found by plain comparisons of its four
+// bytes) covers it, and the repair replaces the others a block at a time.
 // Compiled on x86-64 only; other targets get an empty unit.
 #if defined(__x86_64__) || defined(_M_X64)
 #include <immintrin.h>
@@ -284,7 +287,7 @@ ZUL_AVX512 std::size_t copy_valid_avx512(const std::uint8_t* in, std::size_t n,
   return utf8_boundary_before(in, i);
 }
 
-// ---- Byte by byte: which bytes lie inside a well-formed sequence ----
+// ---- Keep masks: which bytes lie inside a well-formed sequence ----
 //
 // The masks of one block, from its bytes and the next three after each:
 // sequence starts by length, from plain comparisons of the rules of each
@@ -294,8 +297,8 @@ struct start_masks {
   std::uint64_t ascii, start2, start3, start4;
 };
 
-// Keep masks from the start masks of consecutive blocks; carry holds the
-// starts of the block before, shifted out.
+// The keep mask of a block from its start masks and those of the block
+// before, whose last three starts may reach into this one.
 inline std::uint64_t keep_from(const start_masks& s, const start_masks& before) {
   const std::uint64_t any = s.start2 | s.start3 | s.start4;
   const std::uint64_t any_before = before.start2 | before.start3 | before.start4;
