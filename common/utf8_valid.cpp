@@ -44,7 +44,7 @@ std::size_t copy_valid_scalar(const std::uint8_t* in, std::size_t n, std::uint8_
   return end;
 }
 
-constexpr utf8_kernels kScalar{copy_valid_scalar};
+constexpr utf8_kernels kScalar{copy_valid_scalar, nullptr, 1};
 
 }  // namespace
 

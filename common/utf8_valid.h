@@ -33,6 +33,16 @@ struct utf8_kernels {
   // with utf8_scan). When out is not null the prefix is copied there; the
   // kernel may write up to n bytes to out.
   std::size_t (*copy_valid)(const std::uint8_t* in, std::size_t n, std::uint8_t* out) noexcept;
+  // For text dense with faulty bytes (null where the level has none): bit k
+  // of keep[b] tells whether byte 64 * b + k of in lies inside a well-formed
+  // sequence, for each of the given number of 64-byte blocks; in must hold
+  // 64 * blocks + 3 bytes and no sequence from before in may reach into it.
+  // Returns how many bytes past the last block the last sequence covers
+  // (0..3).
+  std::size_t (*keep_masks)(const std::uint8_t* in, std::size_t blocks,
+                            std::uint64_t* keep) noexcept;
+  // Bytes that copy_valid proves at a time (1 for the scalar kernel).
+  std::size_t block;
 };
 
 // Every level's table, for tests and benchmarks.

@@ -73,6 +73,10 @@ TEST(size_gate, every_gated_worker_stops_exactly_at_its_limit) {
                                                 "b\xC3\xA9\xFE"),
                                        "<?>", limit);
        })},
+      {"UTF-8 repair, blocks dense with faults", sized<zul::out_buffer>([](auto limit) {
+         const std::string in = std::string(300, '\xFF') + "\xE2\x82\xAC" + std::string(70, 'x');
+         return zul::text::repair_utf8(bytes_of(in), "<?>", limit);
+       })},
       {"mail subject", sized<std::string>([](auto limit) {
          return enc::encode_mail_subject("h\xC3\xA9llo w\xC3\xB6rld?", limit);
        })},
