@@ -33,7 +33,7 @@ bool spells(const char* p, std::string_view word) {
 
 out_buffer decode_mysql(std::string_view in, simd::isa level) {
   const std::size_t n = in.size();
-  out_buffer out(n);
+  out_buffer out(n, n);  // never longer than the input, whatever its size
   const char* p = in.data();
   std::size_t i = 0;
   if (const auto unescape = simd::kernels_for(detail::mysql_tables(), level).unescape) {
