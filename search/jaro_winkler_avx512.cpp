@@ -36,18 +36,53 @@ ZUL_AVX512 inline __mmask16 first_lanes(std::size_t n) {
   return n >= 16 ? static_cast<__mmask16>(0xFFFF) : static_cast<__mmask16>((1u << n) - 1);
 }
 
-// The OR of the code units of p[0..n): its highest bit bounds them all.
-ZUL_AVX512 __m512i or_of(const std::uint32_t* p, std::size_t n) {
-  __m512i m = _mm512_setzero_si512();
+// The lowest and highest code units of two texts, not both empty.
+ZUL_AVX512 void fold_range(const std::uint32_t* p, std::size_t n, __m512i& low, __m512i& high) {
   std::size_t i = 0;
-  for (; i + 16 <= n; i += 16) m = _mm512_or_si512(m, _mm512_loadu_si512(p + i));
-  return _mm512_or_si512(m, _mm512_maskz_loadu_epi32(first_lanes(n - i), p + i));
+  for (; i + 16 <= n; i += 16) {
+    const __m512i v = _mm512_loadu_si512(p + i);
+    low = _mm512_maskz_min_epu32(0xFFFF, low, v);
+    high = _mm512_maskz_max_epu32(0xFFFF, high, v);
+  }
+  const __mmask16 live = first_lanes(n - i);
+  low = _mm512_mask_min_epu32(low, live, low, _mm512_maskz_loadu_epi32(live, p + i));
+  high = _mm512_mask_max_epu32(high, live, high, _mm512_maskz_loadu_epi32(live, p + i));
+}
+
+ZUL_AVX512 lane_choice choose_lanes_of(std::span<const std::uint32_t> a,
+                                       std::span<const std::uint32_t> b) {
+  __m512i low = _mm512_set1_epi32(-1);
+  __m512i high = _mm512_setzero_si512();
+  fold_range(a.data(), a.size(), low, high);
+  fold_range(b.data(), b.size(), low, high);
+  // Halve the lanes four times: 128-bit quarters, 64-bit halves, 32 bits.
+  for (const int step : {0x4E, 0xB1}) {
+    low = _mm512_maskz_min_epu32(0xFFFF, low, _mm512_maskz_shuffle_i64x2(0xFF, low, low, step));
+    high = _mm512_maskz_max_epu32(0xFFFF, high, _mm512_maskz_shuffle_i64x2(0xFF, high, high, step));
+  }
+  for (const _MM_PERM_ENUM step : {_MM_PERM_BADC, _MM_PERM_CDAB}) {
+    low = _mm512_maskz_min_epu32(0xFFFF, low, _mm512_maskz_shuffle_epi32(0xFFFF, low, step));
+    high = _mm512_maskz_max_epu32(0xFFFF, high, _mm512_maskz_shuffle_epi32(0xFFFF, high, step));
+  }
+  return choose_lanes(
+      static_cast<std::uint32_t>(_mm_cvtsi128_si32(_mm512_maskz_extracti32x4_epi32(0xF, low, 0))),
+      static_cast<std::uint32_t>(_mm_cvtsi128_si32(_mm512_maskz_extracti32x4_epi32(0xF, high, 0))));
 }
 
 // b in 32-bit lanes, 16 per register; lanes at and beyond lb hold the pad.
 struct b_lanes {
   __m512i v[4];
 };
+
+// Up to 64 characters in 32-bit lanes, the pad past their end.
+ZUL_AVX512 b_lanes load_lanes(std::span<const std::uint32_t> text, __m512i pad) {
+  b_lanes w;
+  for (std::size_t k = 0; k < 4; ++k) {
+    const std::size_t from = std::min(16 * k, text.size());
+    w.v[k] = _mm512_mask_loadu_epi32(pad, first_lanes(text.size() - from), text.data() + from);
+  }
+  return w;
+}
 
 // Position masks with b in byte lanes: one register, one compare.
 struct lanes8 {
@@ -159,9 +194,12 @@ ZUL_AVX512 std::size_t count_crossed_walk(std::span<const std::uint32_t> a, std:
 }
 
 // The same count with VBMI2 and the characters of both texts in byte lanes:
-// both sides compressed to the front of one register each.
-ZUL_AVX512_VBMI2 std::size_t count_crossed_bytes(__m512i a, std::uint64_t matched_a, __m512i b,
-                                                 std::uint64_t taken) {
+// both sides compressed to the front of one register each. Vectors come by
+// reference: a function that takes them by value returns with the upper
+// register halves in use, which its caller does not expect, and the SSE
+// code after it then runs slowly.
+ZUL_AVX512_VBMI2 std::size_t count_crossed_bytes(const __m512i& a, std::uint64_t matched_a,
+                                                 const __m512i& b, std::uint64_t taken) {
   const __m512i from_a = _mm512_maskz_compress_epi8(matched_a, a);
   const __m512i from_b = _mm512_maskz_compress_epi8(taken, b);
   const __mmask64 live = _bzhi_u64(~std::uint64_t{0}, static_cast<unsigned>(_mm_popcnt_u64(taken)));
@@ -280,57 +318,46 @@ ZUL_AVX512 std::uint64_t match_short(const Positions& positions,
 ZUL_AVX512 jaro_counts match_word_avx512(std::span<const std::uint32_t> reach,
                                          std::span<const std::uint32_t> b,
                                          std::size_t window) noexcept {
-  // Lanes past the end of b hold a pad that equals no character of a or b:
-  // a bit that none of them has, so masks need no cut at lb. The narrowest
-  // lanes with such a bit to spare are used.
-  alignas(64) std::uint32_t lanes[16];
-  _mm512_store_si512(lanes,
-                     _mm512_or_si512(or_of(b.data(), b.size()), or_of(reach.data(), reach.size())));
-  std::uint32_t used = 0;
-  for (const std::uint32_t lane : lanes) used |= lane;
-  const lane_choice choice = choose_lanes(used);
+  // Lanes past the end of b hold a pad that equals no character of a or b,
+  // so masks need no cut at lb. Characters are compared by their low 8, 16
+  // or 32 bits, the fewest that tell them apart (see choose_lanes).
+  const lane_choice choice = choose_lanes_of(reach, b);
   if (choice.bits == 0) return match_word_scalar(reach, b, window);
   const __m512i pad = _mm512_set1_epi32(static_cast<int>(choice.pad));
-  b_lanes w;
-  for (std::size_t k = 0; k < 4; ++k) {
-    const std::size_t from = std::min(16 * k, b.size());
-    w.v[k] = _mm512_mask_loadu_epi32(pad, first_lanes(b.size() - from), b.data() + from);
+  const b_lanes w = load_lanes(b, pad);
+  if (reach.size() > 64) {
+    if (choice.bits == 8) return match_with(lanes8(w), w, reach, b, window);
+    if (choice.bits == 16) return match_with(lanes16(w), w, reach, b, window);
+    return match_with(lanes32(w), w, reach, b, window);
   }
-  if (reach.size() <= 64) {
-    b_lanes wa;
-    for (std::size_t k = 0; k < 4; ++k) {
-      const std::size_t from = std::min(16 * k, reach.size());
-      wa.v[k] = _mm512_mask_loadu_epi32(pad, first_lanes(reach.size() - from), reach.data() + from);
-    }
-    jaro_counts counts;
-    std::uint64_t taken = 0;
-    std::uint64_t matched_a = 0;
-    if (choice.bits == 8) {
-      const lanes8 in_b(w);
-      matched_a = match_short(in_b, reach, window, taken);
-      if (_mm_popcnt_u64(taken) > kScalarPairs && simd::has_avx512_vbmi2()) {
-        counts.crossed = count_crossed_bytes(lanes8(wa).b, matched_a, in_b.b, taken);
-      } else {
-        counts.crossed = count_crossed_walk(reach, matched_a, b, taken);
-      }
-    } else if (choice.bits == 16) {
-      const lanes16 in_b(w);
-      matched_a = match_short(in_b, reach, window, taken);
-      if (_mm_popcnt_u64(taken) > kScalarPairs && simd::has_avx512_vbmi2()) {
-        counts.crossed = count_crossed_words(lanes16(wa).b, matched_a, in_b.b, taken);
-      } else {
-        counts.crossed = count_crossed_walk(reach, matched_a, b, taken);
-      }
+  // The matched characters of a and the taken positions of b, then the
+  // pairs among them that differ.
+  jaro_counts counts;
+  std::uint64_t taken = 0;
+  if (choice.bits == 8) {
+    const lanes8 in_b(w);
+    const std::uint64_t matched_a = match_short(in_b, reach, window, taken);
+    if (_mm_popcnt_u64(taken) > kScalarPairs && simd::has_avx512_vbmi2()) {
+      counts.crossed =
+          count_crossed_bytes(lanes8(load_lanes(reach, pad)).b, matched_a, in_b.b, taken);
     } else {
-      matched_a = match_short(lanes32(w), reach, window, taken);
       counts.crossed = count_crossed_walk(reach, matched_a, b, taken);
     }
-    counts.matches = static_cast<std::size_t>(_mm_popcnt_u64(taken));
-    return counts;
+  } else if (choice.bits == 16) {
+    const lanes16 in_b(w);
+    const std::uint64_t matched_a = match_short(in_b, reach, window, taken);
+    if (_mm_popcnt_u64(taken) > kScalarPairs && simd::has_avx512_vbmi2()) {
+      counts.crossed =
+          count_crossed_words(lanes16(load_lanes(reach, pad)).b, matched_a, in_b.b, taken);
+    } else {
+      counts.crossed = count_crossed_walk(reach, matched_a, b, taken);
+    }
+  } else {
+    const std::uint64_t matched_a = match_short(lanes32(w), reach, window, taken);
+    counts.crossed = count_crossed_walk(reach, matched_a, b, taken);
   }
-  if (choice.bits == 8) return match_with(lanes8(w), w, reach, b, window);
-  if (choice.bits == 16) return match_with(lanes16(w), w, reach, b, window);
-  return match_with(lanes32(w), w, reach, b, window);
+  counts.matches = static_cast<std::size_t>(_mm_popcnt_u64(taken));
+  return counts;
 }
 
 }  // namespace zul::search::detail
