@@ -59,8 +59,8 @@ constexpr family_tables<byte_set_kernels> kTables{&kScalar, &kSse2,  &kAvx2,
                                                   &kAvx512, nullptr, &kSsse3};
 #elif defined(__aarch64__)
 // Code-point lanes take the scalar path on arm64 for now.
-constexpr byte_set_kernels kNeon{find_first_in_set_neon, find_first_code_point_scalar,
-                                 narrow_until_member_scalar};
+constexpr byte_set_kernels kNeon{find_first_in_set_neon, find_first_code_point_neon,
+                                 narrow_until_member_neon};
 constexpr family_tables<byte_set_kernels> kTables{&kScalar, nullptr, nullptr, nullptr, &kNeon};
 #else
 constexpr family_tables<byte_set_kernels> kTables{&kScalar};

@@ -149,12 +149,17 @@ std::size_t find_first_code_point_avx2(const byte_set& set, const std::uint32_t*
                                        std::size_t n) noexcept;
 std::size_t find_first_code_point_avx512(const byte_set& set, const std::uint32_t* p,
                                          std::size_t n) noexcept;
+std::size_t find_first_code_point_neon(const byte_set& set, const std::uint32_t* p,
+                                       std::size_t n) noexcept;
 std::size_t narrow_until_member_scalar(const byte_set& set, const std::uint32_t* p, std::size_t n,
                                        std::uint8_t* out) noexcept;
 std::size_t narrow_until_member_avx2(const byte_set& set, const std::uint32_t* p, std::size_t n,
                                      std::uint8_t* out) noexcept;
 std::size_t narrow_until_member_avx512(const byte_set& set, const std::uint32_t* p, std::size_t n,
                                        std::uint8_t* out) noexcept;
+
+std::size_t narrow_until_member_neon(const byte_set& set, const std::uint32_t* p, std::size_t n,
+                                     std::uint8_t* out) noexcept;
 
 }  // namespace detail
 }  // namespace zul::simd

@@ -150,6 +150,9 @@ constexpr sql_kernels kScalar{find_boolean_candidate_scalar};
 constexpr sql_kernels kAvx2{find_boolean_candidate_avx2};
 constexpr sql_kernels kAvx512{find_boolean_candidate_avx512};
 constexpr simd::family_tables<sql_kernels> kTables{&kScalar, nullptr, &kAvx2, &kAvx512, nullptr};
+#elif defined(__aarch64__)
+constexpr sql_kernels kNeon{find_boolean_candidate_neon};
+constexpr simd::family_tables<sql_kernels> kTables{&kScalar, nullptr, nullptr, nullptr, &kNeon};
 #else
 constexpr simd::family_tables<sql_kernels> kTables{&kScalar};
 #endif

@@ -19,6 +19,24 @@ constexpr bool is_sql_separator(std::uint8_t b) {
 constexpr bool is_sql_quote(std::uint8_t b) { return b == '\'' || b == '"'; }
 constexpr bool is_boolean_initial(std::uint8_t b) { return (b | 0x20) == 't' || (b | 0x20) == 'f'; }
 
+// Byte classes for the vector kernels, from two nibble look-ups (the method
+// of shuffle-based character classes): class = kLow[b & 15] & kHigh[b >> 4],
+// exact because every class bit stands for one rectangle of low and high
+// nibbles:
+//   bit 0  quote          hi 2, lo 2 or 7       (" ')
+//   bit 1  t T            hi 5 or 7, lo 4
+//   bit 2  f F            hi 4 or 6, lo 6
+//   bit 3  separator      hi 0, 1, 8..15, any lo (0..31, 128..255)
+//   bit 4  separator      hi 2, lo 0, 8, 9, 12   (space ( ) ,)
+//   bit 5  separator      hi 3, lo 11            (;)
+namespace sql_classes {
+inline constexpr char kQuote = 0x01, kInitial = 0x06, kSeparator = 0x38;
+inline constexpr char kLow[16] = {0x18, 0x08, 0x09, 0x08, 0x0A, 0x08, 0x0C, 0x09,
+                                  0x18, 0x18, 0x08, 0x28, 0x18, 0x08, 0x08, 0x08};
+inline constexpr char kHigh[16] = {0x08, 0x08, 0x11, 0x20, 0x04, 0x02, 0x04, 0x02,
+                                   0x08, 0x08, 0x08, 0x08, 0x08, 0x08, 0x08, 0x08};
+}  // namespace sql_classes
+
 struct sql_kernels {
   // Index of the first byte of [p, p + n) that is a quote, or a boolean
   // initial whose previous byte is a separator; n when none is. Reads
@@ -37,5 +55,6 @@ inline const sql_kernels& sql_kernels_for(simd::isa level) noexcept {
 std::size_t find_boolean_candidate_scalar(const std::uint8_t* p, std::size_t n) noexcept;
 std::size_t find_boolean_candidate_avx2(const std::uint8_t* p, std::size_t n) noexcept;
 std::size_t find_boolean_candidate_avx512(const std::uint8_t* p, std::size_t n) noexcept;
+std::size_t find_boolean_candidate_neon(const std::uint8_t* p, std::size_t n) noexcept;
 
 }  // namespace zul::encodings::detail

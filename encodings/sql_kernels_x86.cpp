@@ -1,14 +1,5 @@
 // The boolean-candidate search for x86-64, compiled per function for AVX2
-// and AVX-512 (BW). Each byte gets a class from two nibble look-ups (the
-// method of shuffle-based character classes): class = lo[b & 15] & hi[b >> 4],
-// exact because every class bit stands for one rectangle of low and high
-// nibbles:
-//   bit 0  quote          hi 2, lo 2 or 7       (" ')
-//   bit 1  t T            hi 5 or 7, lo 4
-//   bit 2  f F            hi 4 or 6, lo 6
-//   bit 3  separator      hi 0, 1, 8..15, any lo (0..31, 128..255)
-//   bit 4  separator      hi 2, lo 0, 8, 9, 12   (space ( ) ,)
-//   bit 5  separator      hi 3, lo 11            (;)
+// and AVX-512 (BW), with the nibble class tables of encodings/sql_kernels.h.
 // The previous bytes are classified from a second load one byte back; a
 // byte is a candidate when it is a quote, or an initial after a separator.
 #include "encodings/sql_kernels.h"
@@ -22,13 +13,11 @@
 namespace zul::encodings::detail {
 namespace {
 
-constexpr char kQuote = 0x01, kInitial = 0x06, kSeparator = 0x38;
-
-// lo[l] and hi[h] of the class table above.
-constexpr char kLow[16] = {0x18, 0x08, 0x09, 0x08, 0x0A, 0x08, 0x0C, 0x09,
-                           0x18, 0x18, 0x08, 0x28, 0x18, 0x08, 0x08, 0x08};
-constexpr char kHigh[16] = {0x08, 0x08, 0x11, 0x20, 0x04, 0x02, 0x04, 0x02,
-                            0x08, 0x08, 0x08, 0x08, 0x08, 0x08, 0x08, 0x08};
+using sql_classes::kHigh;
+using sql_classes::kInitial;
+using sql_classes::kLow;
+using sql_classes::kQuote;
+using sql_classes::kSeparator;
 
 struct classes256 {
   __m256i low, high, nibble;

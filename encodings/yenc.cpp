@@ -1,9 +1,9 @@
 // yEnc decoding runs the machine's kernel (AVX-512 VBMI2 compress in
 // encodings/yenc_x86.cpp, table-driven packing for SSSE3 and AVX2 in
-// yenc_pack_x86.cpp). The scalar path, fallback and tail: runs between "="
-// escapes are a plain subtraction of 42, which the compiler vectorises;
-// escapes are handled one at a time. One output buffer of the input's size, reserved and never
-// zero-filled; the result is the part written.
+// yenc_pack_x86.cpp and for NEON in yenc_neon.cpp). The scalar path, fallback and tail: runs
+// between "=" escapes are a plain subtraction of 42, which the compiler vectorises; escapes are
+// handled one at a time. One output buffer of the input's size, reserved and never zero-filled; the
+// result is the part written.
 #include "encodings/yenc.h"
 
 #include <atomic>
@@ -40,6 +40,8 @@ constexpr yenc_kernels kScalar{decode_yenc_scalar};
 constexpr yenc_kernels kSsse3{decode_yenc_ssse3};
 constexpr yenc_kernels kAvx2{decode_yenc_avx2};
 constexpr yenc_kernels kVbmi2{decode_yenc_avx512_vbmi2};
+#elif defined(__aarch64__)
+constexpr yenc_kernels kNeon{decode_yenc_neon};
 #endif
 std::atomic<const yenc_kernels*> active_kernels{nullptr};
 }  // namespace
@@ -53,6 +55,8 @@ const simd::family_tables<yenc_kernels>& yenc_tables() noexcept {
     t.ssse3 = &kSsse3;
     t.avx2 = &kAvx2;
     if (simd::has_avx512_vbmi2()) t.avx512 = &kVbmi2;
+#elif defined(__aarch64__)
+    t.neon = &kNeon;
 #endif
     return t;
   }();

@@ -22,5 +22,6 @@ std::size_t decode_yenc_ssse3(const std::uint8_t* in, std::size_t n, std::uint8_
 std::size_t decode_yenc_avx2(const std::uint8_t* in, std::size_t n, std::uint8_t* out) noexcept;
 std::size_t decode_yenc_avx512_vbmi2(const std::uint8_t* in, std::size_t n,
                                      std::uint8_t* out) noexcept;
+std::size_t decode_yenc_neon(const std::uint8_t* in, std::size_t n, std::uint8_t* out) noexcept;
 
 }  // namespace zul::encodings::detail

@@ -15,7 +15,7 @@
 #if defined(__x86_64__) || defined(_M_X64)
 #include <immintrin.h>
 
-#include <array>
+#include "encodings/yenc_pack.h"
 
 #define ZUL_SSSE3 __attribute__((target("ssse3")))
 #define ZUL_AVX2 __attribute__((target("avx2,bmi,bmi2")))
@@ -23,30 +23,10 @@
 namespace zul::encodings::detail {
 namespace {
 
-// For each 8-bit mask of kept lanes, the shuffle indices of those lanes
-// packed to the front, little-endian in a 64-bit word; unused bytes are
-// 0x80 (the shuffle zeroes them, also after 8 is added to each index).
-constexpr std::array<std::uint64_t, 256> kPack = [] {
-  std::array<std::uint64_t, 256> t{};
-  for (unsigned m = 0; m < 256; ++m) {
-    std::uint64_t word = 0;
-    unsigned k = 0;
-    for (unsigned lane = 0; lane < 8; ++lane) {
-      if (m & (1u << lane)) word |= std::uint64_t{lane} << (8 * k++);
-    }
-    for (; k < 8; ++k) word |= std::uint64_t{0x80} << (8 * k);
-    t[m] = word;
-  }
-  return t;
-}();
-
-// Kept lanes per 8-bit mask (no POPCNT at the SSSE3 level: some CPUs with
-// SSSE3 lack it).
-constexpr std::array<std::uint8_t, 256> kKept = [] {
-  std::array<std::uint8_t, 256> t{};
-  for (unsigned m = 0; m < 256; ++m) t[m] = static_cast<std::uint8_t>(__builtin_popcount(m));
-  return t;
-}();
+using yenc_pack::escapes;
+using yenc_pack::finish;
+using yenc_pack::kKept;
+using yenc_pack::kPack;
 
 // 0xFF in each byte lane whose bit of bits is set.
 ZUL_AVX2 inline __m256i lanes_of(std::uint32_t bits) {
@@ -56,33 +36,6 @@ ZUL_AVX2 inline __m256i lanes_of(std::uint32_t bits) {
                                            2, 2, 2, 2, 2, 3, 3, 3, 3, 3, 3, 3, 3));
   const __m256i bit = _mm256_set1_epi64x(static_cast<long long>(0x8040201008040201ull));
   return _mm256_cmpeq_epi8(_mm256_and_si256(spread, bit), bit);
-}
-
-// The lanes of one block (bits of Mask) that an "=" escapes, given the
-// lanes holding "=" and whether the previous block's last lane escapes the
-// first; carry becomes whether this block's last lane escapes the next.
-template <class Mask>
-inline Mask escapes(Mask eq, bool& carry) {
-  constexpr unsigned kLast = 8 * sizeof(Mask) - 1;
-  Mask escaped = carry ? 1 : 0;
-  Mask pending = eq & static_cast<Mask>(~escaped);
-  carry = false;
-  if ((pending & static_cast<Mask>(pending << 1)) == 0) {
-    // No two "=" in a row (the usual case): each escapes the next lane.
-    carry = (pending >> kLast) != 0;
-    return escaped | static_cast<Mask>(pending << 1);
-  }
-  while (pending != 0) {
-    const unsigned j = static_cast<unsigned>(__builtin_ctz(pending));
-    if (j == kLast) {
-      carry = true;
-      break;
-    }
-    escaped |= static_cast<Mask>(Mask{2} << j);
-    // Clear the "=" at j and the lane it escapes.
-    pending &= static_cast<Mask>(~(Mask{3} << j));
-  }
-  return escaped;
 }
 
 // Stores the kept lanes of one 16-byte half (keep: 16 bits), packed.
@@ -95,19 +48,6 @@ ZUL_SSSE3 inline std::uint8_t* pack_half(__m128i half, unsigned keep, std::uint8
   o += kKept[lo];
   _mm_storel_epi64(reinterpret_cast<__m128i*>(o), _mm_unpackhi_epi64(packed, packed));
   return o + kKept[hi];
-}
-
-// The rest after the blocks: if the last block ended with an unescaped
-// "=", its escaped byte is the first of the rest (or, at the very end, an
-// implied zero).
-std::size_t finish(const std::uint8_t* in, std::size_t i, std::size_t n, bool carry,
-                   std::uint8_t* out, std::uint8_t* o) {
-  if (carry) {
-    const std::uint8_t escaped = i < n ? in[i] : 0;
-    *o++ = static_cast<std::uint8_t>(escaped - 64 - 42);
-    if (i < n) ++i;
-  }
-  return static_cast<std::size_t>(o - out) + decode_yenc_scalar(in + i, n - i, o);
 }
 
 }  // namespace

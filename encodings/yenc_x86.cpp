@@ -16,6 +16,8 @@
 #if defined(__x86_64__) || defined(_M_X64)
 #include <immintrin.h>
 
+#include "encodings/yenc_pack.h"
+
 #define ZUL_AVX512_VBMI2                                                    \
   __attribute__((                                                           \
       target("avx2,bmi,bmi2,avx512f,avx512bw,avx512vl,avx512dq,avx512vbmi," \
@@ -59,14 +61,7 @@ ZUL_AVX512_VBMI2 std::size_t decode_yenc_avx512_vbmi2(const std::uint8_t* in, st
     _mm512_storeu_si512(o, _mm512_maskz_compress_epi8(keep, decoded));
     o += __builtin_popcountll(keep);
   }
-  // The rest: if the last block ended with an unescaped "=", its escaped
-  // byte is the first of the rest (or, at the very end, an implied zero).
-  if (carry) {
-    const std::uint8_t escaped = i < n ? in[i] : 0;
-    *o++ = static_cast<std::uint8_t>(escaped - 64 - 42);
-    if (i < n) ++i;
-  }
-  return static_cast<std::size_t>(o - out) + decode_yenc_scalar(in + i, n - i, o);
+  return yenc_pack::finish(in, i, n, carry, out, o);
 }
 
 }  // namespace zul::encodings::detail

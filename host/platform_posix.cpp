@@ -113,8 +113,16 @@ std::optional<std::string> convert(std::string_view bytes, std::uint32_t from, s
   if (cd == reinterpret_cast<iconv_t>(-1)) return std::nullopt;
   iconv(cd, nullptr, nullptr, nullptr, nullptr);  // reset shift state
 
-  // UTF-32 output is at most 4 bytes per input byte; every other pair fits too.
-  std::string out(bytes.size() * 4 + 16, '\0');
+  // Room for the longest result the pair can give per input unit (a UTF-32
+  // unit may need 4 bytes in any form, a UTF-16 unit 3 in UTF-8, a byte 3),
+  // so that one call converts all. Sizing for UTF-32 in every case would
+  // zero-fill four times the input for each UTF-8 result.
+  const std::size_t unit_in = from == kUTF32 ? 4 : from == kUTF16 ? 2 : 1;
+  const std::size_t most_out = to == kUTF32 || from == kUTF32 ? 4
+                               : to == kUTF8                  ? 3
+                               : to == kUTF16                 ? 2
+                                                              : 1;
+  std::string out(bytes.size() / unit_in * most_out + 16, '\0');
   char* in = const_cast<char*>(bytes.data());
   std::size_t in_left = bytes.size();
   char* at = out.data();

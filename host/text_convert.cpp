@@ -3,8 +3,9 @@
 // ASCII between two ASCII-compatible encodings is copied without the
 // system's converter (the common case in tests and benchmarks). Mac OS Roman
 // goes through the host's own table (host/mac_roman.h), by way of UTF-32;
-// everything else goes to the platform layer (iconv, or the Win32 code
-// pages).
+// UTF-8, UTF-16 and UTF-32 among themselves through the host's own code
+// (host/unicode_forms.h); everything else goes to the platform layer
+// (iconv, or the Win32 code pages).
 #include "host/text_convert.h"
 
 #include <cstdio>
@@ -12,6 +13,7 @@
 
 #include "host/mac_roman.h"
 #include "host/platform.h"
+#include "host/unicode_forms.h"
 #include "plugin/host_types.h"
 
 namespace zul_host {
@@ -51,14 +53,18 @@ std::optional<std::string> convert_text(std::string_view bytes, std::uint32_t fr
   if (!known_encoding(from) || !known_encoding(to)) return std::nullopt;
   if (from == to) return std::string(bytes);
   if (ascii_compatible(from) && ascii_compatible(to) && all_ascii(bytes)) return std::string(bytes);
+  if (is_unicode_form(from) && is_unicode_form(to)) return convert_unicode(bytes, from, to);
   if (from == kMacRoman) {
     std::string wide = mac_roman_to_utf32(bytes);
-    return to == kUTF32 ? std::optional<std::string>(std::move(wide))
-                        : platform::convert(wide, kUTF32, to);
+    if (to == kUTF32) return wide;
+    return is_unicode_form(to) ? convert_unicode(wide, kUTF32, to)
+                               : platform::convert(wide, kUTF32, to);
   }
   if (to == kMacRoman) {
-    const std::optional<std::string> wide =
-        from == kUTF32 ? std::optional<std::string>(bytes) : platform::convert(bytes, from, kUTF32);
+    const std::optional<std::string> wide = from == kUTF32 ? std::optional<std::string>(bytes)
+                                            : is_unicode_form(from)
+                                                ? convert_unicode(bytes, from, kUTF32)
+                                                : platform::convert(bytes, from, kUTF32);
     return wide ? utf32_to_mac_roman(*wide) : std::nullopt;
   }
   return platform::convert(bytes, from, to);

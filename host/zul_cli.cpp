@@ -28,7 +28,8 @@ constexpr std::string_view kUsage =
     "       zul [--plugin PATH] [--host-version V|none] bench [--seconds S] [--json] NAME ARG...\n"
     "options may stand anywhere; after a lone -- every word is an argument\n"
     "string, memoryblock and ptr arguments: TEXT, hex:C3A9, file:PATH, @null,\n"
-    "  or utf8: utf16: utf32: latin1: cp1252: macroman: ascii: followed by TEXT\n";
+    "  or utf8: utf16: utf32: latin1: cp1252: macroman: ascii: followed by TEXT,\n"
+    "  or utf8file: utf16file: (and so on) followed by PATH: the file's bytes in that encoding\n";
 
 struct Prefix {
   std::string_view prefix;
@@ -41,6 +42,20 @@ constexpr Prefix kPrefixes[] = {
 };
 
 bool starts_with(std::string_view s, std::string_view p) { return s.substr(0, p.size()) == p; }
+
+// The path of a "file:" form, or of an encoding's file form ("utf8file:"
+// and the like, whose bytes are taken as that encoding, unconverted), with
+// the encoding the bytes carry; nullopt for other forms.
+std::optional<std::pair<std::string, std::uint32_t>> file_form(std::string_view text) {
+  if (starts_with(text, "file:")) return std::pair{std::string(text.substr(5)), kUnknown};
+  for (const Prefix& p : kPrefixes) {
+    const std::string_view name = p.prefix.substr(0, p.prefix.size() - 1);
+    if (starts_with(text, name) && starts_with(text.substr(name.size()), "file:")) {
+      return std::pair{std::string(text.substr(name.size() + 5)), p.encoding};
+    }
+  }
+  return std::nullopt;
+}
 
 // What is wrong with the digits of a "hex:" form, or "".
 std::string hex_problem(std::string_view hex) {
@@ -98,10 +113,10 @@ std::optional<Str> parse_bytes(std::string_view text) {
     if (!bytes) return std::nullopt;
     return tagged(*bytes, kUnknown);
   }
-  if (starts_with(text, "file:")) {
-    auto bytes = read_file(std::string(text.substr(5)));
+  if (const auto file = file_form(text)) {
+    auto bytes = read_file(file->first);
     if (!bytes) return std::nullopt;
-    return tagged(std::move(*bytes), kUnknown);
+    return tagged(std::move(*bytes), file->second);
   }
   for (const Prefix& p : kPrefixes) {
     if (starts_with(text, p.prefix)) {
@@ -166,10 +181,7 @@ std::string format_bytes(std::string_view bytes, std::uint32_t encoding, bool* a
 
 std::string argument_problem(std::string_view text) {
   if (starts_with(text, "hex:")) return hex_problem(text.substr(4));
-  if (starts_with(text, "file:")) {
-    const std::string path(text.substr(5));
-    return file_problem(path);
-  }
+  if (const auto file = file_form(text)) return file_problem(file->first);
   return "";
 }
 

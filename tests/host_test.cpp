@@ -224,6 +224,13 @@ TEST(text_convert, round_trips_and_refusals) {
       {std::string("\x00\xD8\x00\x00", 4), kUTF32, kUTF8, std::nullopt, "UTF-32 surrogate"},
       {std::string("\x00\x00\x11\x00", 4), kUTF32, kUTF8, std::nullopt, "beyond U+10FFFF"},
       {std::string("\x3D\xD8", 2), kUTF16, kUTF32, std::nullopt, "high surrogate at the end"},
+      {std::string("\x3D\xD8\x41\x00", 4), kUTF16, kUTF8, std::nullopt, "high, then no low"},
+      {std::string("A\0B", 3), kUTF16, kUTF8, std::nullopt, "odd-length UTF-16"},
+      {std::string("A\0\0\0B", 5), kUTF32, kUTF16, std::nullopt, "UTF-32 of 5 bytes"},
+      {"a\xE2\x82", kUTF8, kUTF32, std::nullopt, "UTF-8 cut short"},
+      {"\xF4\x90\x80\x80", kUTF8, kUTF16, std::nullopt, "UTF-8 beyond U+10FFFF"},
+      {std::string("\x00\xF6\x01\x00", 4), kUTF32, kUTF16, std::string("\x3D\xD8\x00\xDE", 4),
+       "pair made"},
   };
   for (const auto& row : rows) {
     SCOPED_TRACE(row.why);

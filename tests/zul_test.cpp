@@ -5,6 +5,8 @@
 
 #include <algorithm>
 #include <cstdio>
+#include <filesystem>
+#include <fstream>
 #include <sstream>
 
 #include "host/zul_cli.h"
@@ -36,6 +38,7 @@ TEST(parse_argument, forms_by_type) {
        "UTF-32 host order"},
       {ValueType::string, "ascii:é", std::nullopt, "does not convert to ASCII"},
       {ValueType::string, "file:/no/such/file", std::nullopt, "unreadable file"},
+      {ValueType::string, "utf8file:/no/such/file", std::nullopt, "unreadable UTF-8 file"},
       {ValueType::string, "12", utf8("12"), "a string takes anything"},
   };
   for (const auto& row : rows) {
@@ -69,6 +72,16 @@ TEST(parse_argument, forms_by_type) {
                                                           : (got->boolean ? 1.0 : 0.0);
     EXPECT_EQ(value, row.want);
   }
+  // A file's bytes as they are: without an encoding, or tagged, never converted.
+  const auto path = std::filesystem::temp_directory_path() / "zul-parse-argument.txt";
+  std::ofstream(path, std::ios::binary) << "caf\xC3\xA9";
+  for (const auto& [form, encoding] : {std::pair{"file:", kUnknown}, std::pair{"utf8file:", kUTF8},
+                                       std::pair{"latin1file:", kLatin1}}) {
+    const auto got = parse_argument(ValueType::string, form + path.string());
+    ASSERT_TRUE(got.has_value()) << form;
+    EXPECT_EQ(got->string, tagged("caf\xC3\xA9", encoding)) << form;
+  }
+  std::filesystem::remove(path);
   const auto block = parse_argument(ValueType::memory_block, "hex:0001");
   ASSERT_TRUE(block.has_value());
   EXPECT_EQ(block->block, (Block{std::string("\0\1", 2), false}));
