@@ -30,7 +30,13 @@ ZUL_AVX2 lane_choice choose_lanes_of(std::span<const std::uint32_t> a,
   __m256i low = none;
   __m256i high = _mm256_setzero_si256();
   for (const auto text : {a, b}) {
-    for (std::size_t i = 0; i < text.size(); i += 8) {
+    std::size_t i = 0;
+    for (; i + 8 <= text.size(); i += 8) {
+      const __m256i v = _mm256_loadu_si256(reinterpret_cast<const __m256i*>(text.data() + i));
+      low = _mm256_min_epu32(low, v);
+      high = _mm256_max_epu32(high, v);
+    }
+    if (i < text.size()) {
       __m256i live;
       const __m256i v = first_eight(text.data() + i, text.size() - i, live);
       low = _mm256_min_epu32(low, _mm256_blendv_epi8(none, v, live));
