@@ -32,6 +32,9 @@ namespace {
 // their stores.
 constexpr long long kScalarPairs = 16;
 
+// A reach of a up to this long is matched one character at a time.
+constexpr std::size_t kShortestPairs = 16;
+
 ZUL_AVX512 inline __mmask16 first_lanes(std::size_t n) {
   return n >= 16 ? static_cast<__mmask16>(0xFFFF) : static_cast<__mmask16>((1u << n) - 1);
 }
@@ -49,6 +52,12 @@ ZUL_AVX512 void fold_range(const std::uint32_t* p, std::size_t n, __m512i& low, 
   high = _mm512_mask_max_epu32(high, live, high, _mm512_maskz_loadu_epi32(live, p + i));
 }
 
+ZUL_AVX512 void fold_lanes(__m512i& low, __m512i& high, const __m512i& other_low,
+                           const __m512i& other_high) {
+  low = _mm512_maskz_min_epu32(0xFFFF, low, other_low);
+  high = _mm512_maskz_max_epu32(0xFFFF, high, other_high);
+}
+
 ZUL_AVX512 lane_choice choose_lanes_of(std::span<const std::uint32_t> a,
                                        std::span<const std::uint32_t> b) {
   __m512i low = _mm512_set1_epi32(-1);
@@ -56,14 +65,15 @@ ZUL_AVX512 lane_choice choose_lanes_of(std::span<const std::uint32_t> a,
   fold_range(a.data(), a.size(), low, high);
   fold_range(b.data(), b.size(), low, high);
   // Halve the lanes four times: 128-bit quarters, 64-bit halves, 32 bits.
-  for (const int step : {0x4E, 0xB1}) {
-    low = _mm512_maskz_min_epu32(0xFFFF, low, _mm512_maskz_shuffle_i64x2(0xFF, low, low, step));
-    high = _mm512_maskz_max_epu32(0xFFFF, high, _mm512_maskz_shuffle_i64x2(0xFF, high, high, step));
-  }
-  for (const _MM_PERM_ENUM step : {_MM_PERM_BADC, _MM_PERM_CDAB}) {
-    low = _mm512_maskz_min_epu32(0xFFFF, low, _mm512_maskz_shuffle_epi32(0xFFFF, low, step));
-    high = _mm512_maskz_max_epu32(0xFFFF, high, _mm512_maskz_shuffle_epi32(0xFFFF, high, step));
-  }
+  // (The shuffles take immediates, so the steps are written out.)
+  fold_lanes(low, high, _mm512_maskz_shuffle_i64x2(0xFF, low, low, 0x4E),
+             _mm512_maskz_shuffle_i64x2(0xFF, high, high, 0x4E));
+  fold_lanes(low, high, _mm512_maskz_shuffle_i64x2(0xFF, low, low, 0xB1),
+             _mm512_maskz_shuffle_i64x2(0xFF, high, high, 0xB1));
+  fold_lanes(low, high, _mm512_maskz_shuffle_epi32(0xFFFF, low, _MM_PERM_BADC),
+             _mm512_maskz_shuffle_epi32(0xFFFF, high, _MM_PERM_BADC));
+  fold_lanes(low, high, _mm512_maskz_shuffle_epi32(0xFFFF, low, _MM_PERM_CDAB),
+             _mm512_maskz_shuffle_epi32(0xFFFF, high, _MM_PERM_CDAB));
   return choose_lanes(
       static_cast<std::uint32_t>(_mm_cvtsi128_si32(_mm512_maskz_extracti32x4_epi32(0xF, low, 0))),
       static_cast<std::uint32_t>(_mm_cvtsi128_si32(_mm512_maskz_extracti32x4_epi32(0xF, high, 0))));
@@ -325,7 +335,9 @@ ZUL_AVX512 jaro_counts match_word_avx512(std::span<const std::uint32_t> reach,
   if (choice.bits == 0) return match_word_scalar(reach, b, window);
   const __m512i pad = _mm512_set1_epi32(static_cast<int>(choice.pad));
   const b_lanes w = load_lanes(b, pad);
-  if (reach.size() > 64) {
+  // Up to 16 characters of a, reading the picks back costs more than the
+  // pairs save; beyond 64 they do not fit one mask.
+  if (reach.size() > 64 || reach.size() <= kShortestPairs) {
     if (choice.bits == 8) return match_with(lanes8(w), w, reach, b, window);
     if (choice.bits == 16) return match_with(lanes16(w), w, reach, b, window);
     return match_with(lanes32(w), w, reach, b, window);
