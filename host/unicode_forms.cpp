@@ -30,6 +30,12 @@ bool decode(std::string_view bytes, std::uint32_t from, Emit emit) {
   const std::size_t n = bytes.size();
   if (from == kUTF8) {
     for (std::size_t i = 0; i < n;) {
+      // Eight ASCII bytes at a time: the usual text.
+      if (n - i >= 8 && (load<std::uint64_t>(p + i) & 0x8080808080808080ull) == 0) {
+        for (std::size_t k = 0; k < 8; ++k) emit(p[i + k]);
+        i += 8;
+        continue;
+      }
       const std::uint32_t c = p[i];
       if (c < 0x80) {
         emit(c);
@@ -76,6 +82,13 @@ bool decode(std::string_view bytes, std::uint32_t from, Emit emit) {
   }
   if (n % 4 != 0) return false;
   for (std::size_t i = 0; i < n; i += 4) {
+    // Four ASCII units at a time (none has a bit above the low seven).
+    if (n - i >= 16 && ((load<std::uint64_t>(p + i) | load<std::uint64_t>(p + i + 8)) &
+                        0xFFFFFF80FFFFFF80ull) == 0) {
+      for (std::size_t k = 0; k < 16; k += 4) emit(p[i + k]);
+      i += 12;
+      continue;
+    }
     const std::uint32_t cp = load<std::uint32_t>(p + i);
     if (cp > 0x10FFFF || (cp >= 0xD800 && cp <= 0xDFFF)) return false;
     emit(cp);

@@ -10,6 +10,10 @@
 #include <map>
 #include <string_view>
 
+#if defined(__unix__) || defined(__APPLE__)
+#include <sys/resource.h>
+#endif
+
 namespace zul_host {
 namespace {
 
@@ -44,6 +48,16 @@ double memcpy_gbps(std::uint64_t bytes, double seconds) {
   copy_bytes(to.data(), from.data(), n);  // touch both buffers first
   const timing t = repeat_for(seconds, [&] { copy_bytes(to.data(), from.data(), n); });
   return static_cast<double>(n) / t.ns_per_call();
+}
+
+// Minor page faults of the process so far (first touches of fresh memory),
+// or 0 where the system does not count them.
+long page_faults() {
+#if defined(__unix__) || defined(__APPLE__)
+  rusage usage{};
+  if (getrusage(RUSAGE_SELF, &usage) == 0) return usage.ru_minflt;
+#endif
+  return 0;
 }
 
 std::string format_number(double value, const char* format) {
@@ -81,13 +95,17 @@ int bench_call(Host& host, const std::string& declaration, const std::vector<Dyn
   }
   timing timed;
   std::map<std::string, long> before, after;
+  long faults = 0;
   {
     RepeatedCall call(host, declaration, args);
     repeat_for(options.seconds / 10, [&] { call.invoke(); });  // warm-up
     before = host.conversions();
+    faults = page_faults();
     timed = repeat_for(options.seconds, [&] { call.invoke(); });
+    faults = page_faults() - faults;
     after = host.conversions();
   }
+  const double faults_per_call = static_cast<double>(faults) / static_cast<double>(timed.calls);
   const std::uint64_t bytes = input_bytes(args);
   const double ns = timed.ns_per_call();
   const double gbps = ns > 0 ? static_cast<double>(bytes) / ns : 0;
@@ -103,7 +121,9 @@ int bench_call(Host& host, const std::string& declaration, const std::vector<Dyn
     out << "{\"name\":\"" << name_of(declaration) << "\",\"calls\":" << timed.calls
         << ",\"ns_per_call\":" << format_number(ns, "%.3f") << ",\"input_bytes\":" << bytes
         << ",\"gbps\":" << format_number(gbps, "%.4f")
-        << ",\"memcpy_gbps\":" << format_number(copy_gbps, "%.4f") << ",\"host_conversions\":{";
+        << ",\"memcpy_gbps\":" << format_number(copy_gbps, "%.4f")
+        << ",\"page_faults_per_call\":" << format_number(faults_per_call, "%.2f")
+        << ",\"host_conversions\":{";
     const char* comma = "";
     for (const auto& [label, per_call] : conversions) {
       out << comma << "\"" << label << "\":" << format_number(per_call, "%.3f");
@@ -119,6 +139,8 @@ int bench_call(Host& host, const std::string& declaration, const std::vector<Dyn
       << " GB/s; memcpy of as many bytes: " << format_number(copy_gbps, "%.3f") << " GB/s";
   if (copy_gbps > 0 && bytes > 0)
     out << " (" << format_number(100 * gbps / copy_gbps, "%.1f") << "%)";
+  out << "\n  page faults per call (first touches of fresh memory): "
+      << format_number(faults_per_call, "%.1f");
   out << "\n  text conversions by the host per call: ";
   if (conversions.empty()) out << "none";
   const char* comma = "";

@@ -24,7 +24,8 @@ std::uint64_t input_bytes(const std::vector<DynamicValue>& args);
 // Calls declaration once as a check (a raised exception gives 1, an
 // unbalanced ledger 3), warms up, repeats the call for options.seconds and
 // prints nanoseconds per call, input GB/s, the GB/s of memcpy of the input
-// size and the text conversions the host performed per call. Returns 0.
+// size, the minor page faults and the text conversions the host performed
+// per call. Returns 0.
 int bench_call(Host& host, const std::string& declaration, const std::vector<DynamicValue>& args,
                const BenchOptions& options, std::ostream& out, std::ostream& err);
 

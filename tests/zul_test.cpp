@@ -262,8 +262,8 @@ TEST(run_zul, bench_prints_figures_and_host_conversions) {
   const ZulRun json = zul({"bench", "--seconds", "0.02", "--json", "FakeEchoZUL", "hello"});
   ASSERT_EQ(json.status, 0) << json.err;
   EXPECT_EQ(json.out.find("{\"name\":\"FakeEchoZUL\",\"calls\":"), 0u) << json.out;
-  for (const char* key : {"\"ns_per_call\":", "\"input_bytes\":5,",
-                          "\"gbps\":", "\"memcpy_gbps\":", "\"host_conversions\":{"}) {
+  for (const char* key : {"\"ns_per_call\":", "\"input_bytes\":5,", "\"gbps\":", "\"memcpy_gbps\":",
+                          "\"page_faults_per_call\":", "\"host_conversions\":{"}) {
     EXPECT_NE(json.out.find(key), std::string::npos) << key << " in " << json.out;
   }
   EXPECT_EQ(std::count(json.out.begin(), json.out.end(), '\n'), 1);
