@@ -68,6 +68,9 @@ const family_tables<utf8_kernels>& utf8_tables() noexcept {
 #if defined(__x86_64__)
   static constexpr family_tables<utf8_kernels> tables{&kScalar, &detail::kUtf8Sse2,
                                                       &detail::kUtf8Avx2, &detail::kUtf8Avx512};
+#elif defined(__aarch64__)
+  static constexpr family_tables<utf8_kernels> tables{&kScalar, nullptr, nullptr, nullptr,
+                                                      &detail::kUtf8Neon};
 #else
   static constexpr family_tables<utf8_kernels> tables{&kScalar};
 #endif

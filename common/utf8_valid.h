@@ -51,8 +51,9 @@ const family_tables<utf8_kernels>& utf8_tables() noexcept;
 const utf8_kernels& utf8_active() noexcept;
 
 namespace detail {
-// The block kernels of x86-64 (null elsewhere).
-extern const utf8_kernels kUtf8Sse2, kUtf8Avx2, kUtf8Avx512;
+// The block kernels of x86-64 and of arm64 (each defined on its own
+// architecture only).
+extern const utf8_kernels kUtf8Sse2, kUtf8Avx2, kUtf8Avx512, kUtf8Neon;
 // The boundary at or before offset end of in: end, moved back over a
 // sequence that begins before end and would end after it. Every sequence
 // before end must already be known well formed.

@@ -1,11 +1,5 @@
-// x86-64 block kernels for UTF-8 well-formedness (lookup-table method).
-// Each byte is judged with the byte before it through three 16-entry table
-// look-ups (high nibble of the previous byte, its low nibble, high nibble of
-// this byte); each table entry is a set of error classes, and a byte pair is
-// faulty when some class is in all three. A separate test requires a
-// continuation byte two bytes after a lead of E0..FF and three bytes after
-// F0..FF; it is XORed with the "two continuations in a row" class so that
-// exactly the expected continuations pass. A block of ASCII is checked only
+// x86-64 block kernels for UTF-8 well-formedness (lookup-table method, with
+// the tables of common/utf8_classes.h). A block of ASCII is checked only
 // for a sequence that the previous block left open. The SSE2 level lacks
 // byte shuffles and copies ASCII blocks only.
 // For text dense with faults, keep masks judge every byte on its own: it is
@@ -15,75 +9,13 @@
 #if defined(__x86_64__) || defined(_M_X64)
 #include <immintrin.h>
 
+#include "common/utf8_classes.h"
 #include "common/utf8_valid.h"
 
 namespace zul::simd::detail {
 namespace {
 
-// Error classes: the bits of the table entries.
-constexpr std::uint8_t kTooShort = 1 << 0;      // lead, then no continuation
-constexpr std::uint8_t kTooLong = 1 << 1;       // ASCII, then a continuation
-constexpr std::uint8_t kOverlong3 = 1 << 2;     // E0 80..9F
-constexpr std::uint8_t kTooLarge = 1 << 3;      // F4 90..BF, F5..FF 90..BF
-constexpr std::uint8_t kSurrogate = 1 << 4;     // ED A0..BF
-constexpr std::uint8_t kOverlong2 = 1 << 5;     // C0, C1
-constexpr std::uint8_t kTooLarge1000 = 1 << 6;  // F5..FF 80..8F
-constexpr std::uint8_t kOverlong4 = 1 << 6;     // F0 80..8F
-constexpr std::uint8_t kTwoConts = 1 << 7;      // continuation, continuation
-constexpr std::uint8_t kCarry = kTooShort | kTooLong | kTwoConts;
-
-// Indexed by the high nibble of the previous byte.
-constexpr std::uint8_t kByte1High[16] = {kTooLong,
-                                         kTooLong,
-                                         kTooLong,
-                                         kTooLong,
-                                         kTooLong,
-                                         kTooLong,
-                                         kTooLong,
-                                         kTooLong,
-                                         kTwoConts,
-                                         kTwoConts,
-                                         kTwoConts,
-                                         kTwoConts,
-                                         kTooShort | kOverlong2,
-                                         kTooShort,
-                                         kTooShort | kOverlong3 | kSurrogate,
-                                         kTooShort | kTooLarge | kTooLarge1000 | kOverlong4};
-// Indexed by the low nibble of the previous byte.
-constexpr std::uint8_t kByte1Low[16] = {kCarry | kOverlong3 | kOverlong2 | kOverlong4,
-                                        kCarry | kOverlong2,
-                                        kCarry,
-                                        kCarry,
-                                        kCarry | kTooLarge,
-                                        kCarry | kTooLarge | kTooLarge1000,
-                                        kCarry | kTooLarge | kTooLarge1000,
-                                        kCarry | kTooLarge | kTooLarge1000,
-                                        kCarry | kTooLarge | kTooLarge1000,
-                                        kCarry | kTooLarge | kTooLarge1000,
-                                        kCarry | kTooLarge | kTooLarge1000,
-                                        kCarry | kTooLarge | kTooLarge1000,
-                                        kCarry | kTooLarge | kTooLarge1000,
-                                        kCarry | kTooLarge | kTooLarge1000 | kSurrogate,
-                                        kCarry | kTooLarge | kTooLarge1000,
-                                        kCarry | kTooLarge | kTooLarge1000};
-// Indexed by the high nibble of this byte.
-constexpr std::uint8_t kByte2High[16] = {
-    kTooShort,
-    kTooShort,
-    kTooShort,
-    kTooShort,
-    kTooShort,
-    kTooShort,
-    kTooShort,
-    kTooShort,
-    kTooLong | kOverlong2 | kTwoConts | kOverlong3 | kTooLarge1000 | kOverlong4,
-    kTooLong | kOverlong2 | kTwoConts | kOverlong3 | kTooLarge,
-    kTooLong | kOverlong2 | kTwoConts | kSurrogate | kTooLarge,
-    kTooLong | kOverlong2 | kTwoConts | kSurrogate | kTooLarge,
-    kTooShort,
-    kTooShort,
-    kTooShort,
-    kTooShort};
+using namespace utf8_classes;
 
 // A 16-entry table repeated four times: one load fills every 128-bit lane.
 struct lane_table {

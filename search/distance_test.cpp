@@ -22,18 +22,20 @@ using zul::reference::edit_distance_reference;
 using zul::reference::jaro_winkler_distance_reference;
 using text = std::vector<std::uint32_t>;
 
-// Letters from one of three alphabets: bytes, code points that all share a
-// hash slot family, and a mix with the largest code points.
+// Letters from one of six alphabets: bytes, code points that all share a
+// hash slot family, a mix with the largest code points, and runs across
+// 0x100 and 0x10000 that the vector kernels tell apart by their low 8 or
+// 16 bits alone.
 text random_text(std::mt19937& rng, std::size_t len) {
   static constexpr std::uint32_t kMixed[] = {'a', 'b', 'c', 0x1F600, 0xE9, 0x10FFFF, 0x100, 0xFF};
+  static constexpr std::uint32_t kFirst[] = {'a', 0x4E00, 0, 0xF0, 0xFFD0, 0xFF00};
+  static constexpr std::uint32_t kStep[] = {1, 128, 0, 30, 20, 100};
   text t(len);
   const std::size_t letters = 2 + rng() % 7;
-  const int kind = static_cast<int>(rng() % 3);
+  const std::size_t kind = rng() % 6;
   for (auto& c : t) {
     const std::size_t pick = rng() % letters;
-    c = kind == 0   ? 'a' + static_cast<std::uint32_t>(pick)
-        : kind == 1 ? 0x4E00 + static_cast<std::uint32_t>(pick) * 128
-                    : kMixed[pick];
+    c = kind == 2 ? kMixed[pick] : kFirst[kind] + static_cast<std::uint32_t>(pick) * kStep[kind];
   }
   return t;
 }

@@ -29,20 +29,21 @@ struct jaro_kernels {
                             std::size_t window) noexcept;
 };
 
-// Lanes for the vector kernels: the narrowest width (8, 16 or 32 bits) that
-// holds every code unit whose bits lie in used and leaves one bit to spare,
-// and the pad, that bit alone, which equals none of those code units, for
-// the lanes past the end of b. bits is 0 when used has every bit set.
+// Lanes for the vector kernels: the narrowest width (8, 16 or 32 bits) in
+// which the code units from low to high (those of b and of the reach of a)
+// keep distinct low bits, and the pad for the lanes past the end of b. Any
+// 2^bits - 1 consecutive values have distinct low bits and leave out those
+// of low - 1, which is then the pad: it equals none of them. bits is 0 when
+// the code units span every 32-bit value.
 struct lane_choice {
   int bits = 8;
   std::uint32_t pad = 0;
 };
-constexpr lane_choice choose_lanes(std::uint32_t used) noexcept {
+constexpr lane_choice choose_lanes(std::uint32_t low, std::uint32_t high) noexcept {
+  const std::uint32_t span = high - low;
   lane_choice c;
-  while (c.bits < 32 && (used >> c.bits != 0 || (~used & ((1u << c.bits) - 1)) == 0)) c.bits *= 2;
-  const std::uint32_t spare = ~used & (c.bits == 32 ? ~0u : (1u << c.bits) - 1);
-  if (spare == 0) c.bits = 0;
-  c.pad = spare & (0 - spare);
+  c.bits = span < 0xFFu ? 8 : span < 0xFFFFu ? 16 : span < 0xFFFFFFFFu ? 32 : 0;
+  c.pad = low - 1;
   return c;
 }
 

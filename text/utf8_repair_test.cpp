@@ -71,12 +71,17 @@ TEST(repair_utf8, table_boundaries) {
                 pad + std::string(row.want) + pad);
       EXPECT_EQ(repair_utf8(bytes_of(row.in), "?", kMaxResultBytes, kernels(level)).view(),
                 row.want);
-      // Ending at a block edge, before blocks of ASCII that a kernel may skip.
-      const std::string head(64 - row.in.size(), 'x'), tail(192, 'x');
-      EXPECT_EQ(repair_utf8(bytes_of(head + std::string(row.in) + tail), "?", kMaxResultBytes,
-                            kernels(level))
-                    .view(),
-                head + std::string(row.want) + tail);
+      // Ending at a block edge, before blocks of ASCII that a kernel may
+      // skip: 64 for the x86 kernels, 80 for the NEON kernel's runs of four
+      // 16-byte blocks after the first.
+      for (const std::size_t edge : {64, 80}) {
+        const std::string head(edge - row.in.size(), 'x'), tail(192, 'x');
+        EXPECT_EQ(repair_utf8(bytes_of(head + std::string(row.in) + tail), "?", kMaxResultBytes,
+                              kernels(level))
+                      .view(),
+                  head + std::string(row.want) + tail)
+            << "edge " << edge;
+      }
     }
   }
 }
