@@ -320,8 +320,7 @@ const codec_row kCodecs[] = {
      "+"},
     {"remove_html_tags",
      [](std::string_view in, zul::simd::isa k) {
-       benchmark::DoNotOptimize(
-           zul::encodings::remove_html_tags(in, "", zul::kMaxResultBytes, zul::scan_for(k)));
+       benchmark::DoNotOptimize(zul::encodings::remove_html_tags(in, "", zul::kMaxResultBytes, k));
      },
      "<>"},
     {"encode_quoted_printable",
@@ -335,6 +334,11 @@ const codec_row kCodecs[] = {
        benchmark::DoNotOptimize(zul::encodings::decode_quoted_printable(in, zul::scan_for(k)));
      },
      "=\n"},
+    {"decode_mysql",
+     [](std::string_view in, zul::simd::isa k) {
+       benchmark::DoNotOptimize(zul::encodings::decode_mysql(in, k));
+     },
+     "\\"},
     {"replace_sql_booleans",
      [](std::string_view in, zul::simd::isa k) {
        benchmark::DoNotOptimize(

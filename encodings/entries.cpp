@@ -205,7 +205,9 @@ REALstring RemoveHTMLTags(REALstring s) noexcept { return RemoveHTMLTagsWith(s, 
 // SQL helpers.
 REALstring DecodingFromMySQL(REALstring s) noexcept {
   if (!s) return nullptr;
-  return quietly<REALstring>(nullptr, [&] { return decode_stored_bytes(s, enc::decode_mysql); });
+  return quietly<REALstring>(nullptr, [&] {
+    return decode_stored_bytes(s, [](std::string_view in) { return enc::decode_mysql(in); });
+  });
 }
 
 REALstring SQLReplaceBooleanZUL(REALstring sql) noexcept {

@@ -16,10 +16,10 @@ namespace zul::encodings {
 // depth is exactly 0, and replacement (possibly empty) for each other byte,
 // so replacement appears once per byte inside a tag.
 // Output that would pass limit bytes gives "" (the removal stops there).
-// Throws std::bad_alloc when memory runs out. scan is the byte-set search to
-// use.
+// Throws std::bad_alloc when memory runs out. level picks the kernels (the
+// block kernel where it has one, else its byte-set search).
 out_buffer remove_html_tags(std::string_view utf8, std::string_view replacement,
                             std::uint64_t limit = kMaxResultBytes,
-                            const scan_kernels& scan = machine_scan());
+                            simd::isa level = simd::best_isa());
 
 }  // namespace zul::encodings

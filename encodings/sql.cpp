@@ -3,7 +3,9 @@
 // candidate byte to the next (a quote, or a "t" or "f" that starts a word:
 // encodings/sql_kernels.h) and, inside quotes, to the closing quote; the
 // bytes in between are copied whole. A word byte is anything but a
-// separator, quotes included.
+// separator, quotes included. Unescaping runs the level's block kernel
+// (encodings/sql_unescape_vbmi2.cpp) where there is one; memchr finds the
+// next backslash for the rest.
 #include "encodings/sql.h"
 
 #include <array>
@@ -13,24 +15,6 @@
 
 namespace zul::encodings {
 namespace {
-
-// The byte each MySQL escape letter stands for; 0xFFFF: no escape.
-constexpr std::array<std::uint16_t, 256> kMySQLEscapes = [] {
-  std::array<std::uint16_t, 256> table{};
-  for (auto& entry : table) entry = 0xFFFF;
-  table['0'] = 0;
-  table['\''] = '\'';
-  table['"'] = '"';
-  table['b'] = 8;
-  table['n'] = '\n';
-  table['r'] = '\r';
-  table['t'] = '\t';
-  table['Z'] = 26;
-  table['\\'] = '\\';
-  table['%'] = '%';
-  table['_'] = '_';
-  return table;
-}();
 
 // Bytes checked one by one before a vector search starts.
 constexpr std::size_t kProbe = 16;
@@ -47,26 +31,33 @@ bool spells(const char* p, std::string_view word) {
 
 }  // namespace
 
-std::string decode_mysql(std::string_view in) {
+out_buffer decode_mysql(std::string_view in, simd::isa level) {
   const std::size_t n = in.size();
-  std::string out;
-  out.reserve(n);
+  out_buffer out(n, n);  // never longer than the input, whatever its size
+  const char* p = in.data();
   std::size_t i = 0;
+  if (const auto unescape = simd::kernels_for(detail::mysql_tables(), level).unescape) {
+    std::size_t written = 0;
+    i = unescape(reinterpret_cast<const std::uint8_t*>(p), n, out.tail(), &written);
+    out.commit(written);
+  }
   while (i < n) {
-    const void* slash = std::memchr(in.data() + i, '\\', n - i);
-    const std::size_t at =
-        slash ? static_cast<std::size_t>(static_cast<const char*>(slash) - in.data()) : n;
-    out.append(in.data() + i, at - i);
-    i = at;
+    if (p[i] != '\\') {  // escapes in a row skip the search
+      const void* slash = std::memchr(p + i, '\\', n - i);
+      const std::size_t at =
+          slash ? static_cast<std::size_t>(static_cast<const char*>(slash) - p) : n;
+      out.put(p + i, at - i);
+      i = at;
+    }
     if (i + 1 >= n) {  // no backslash, or a final one: kept as it is
-      out.append(in.data() + i, n - i);
+      out.put(p + i, n - i);
       break;
     }
-    const std::uint16_t decoded = kMySQLEscapes[static_cast<std::uint8_t>(in[i + 1])];
+    const std::uint16_t decoded = detail::kMySQLEscapes[static_cast<std::uint8_t>(p[i + 1])];
     if (decoded == 0xFFFF) {
-      out.append(in.data() + i, 2);
+      out.put(p + i, 2);
     } else {
-      out += static_cast<char>(decoded);
+      out.put_byte(static_cast<std::uint8_t>(decoded));
     }
     i += 2;
   }
@@ -157,7 +148,23 @@ constexpr simd::family_tables<sql_kernels> kTables{&kScalar, nullptr, nullptr, n
 constexpr simd::family_tables<sql_kernels> kTables{&kScalar};
 #endif
 std::atomic<const sql_kernels*> active_kernels{nullptr};
+constexpr mysql_kernels kNoUnescape{nullptr};
 }  // namespace
+
+const simd::family_tables<mysql_kernels>& mysql_tables() noexcept {
+#if defined(__x86_64__) || defined(_M_X64)
+  static constexpr mysql_kernels kVbmi2{unescape_mysql_avx512_vbmi2};
+#endif
+  // Built once: whether the AVX-512 level has a kernel depends on VBMI2.
+  static const simd::family_tables<mysql_kernels> tables = [] {
+    simd::family_tables<mysql_kernels> t{&kNoUnescape};
+#if defined(__x86_64__) || defined(_M_X64)
+    if (simd::has_avx512_vbmi2()) t.avx512 = &kVbmi2;
+#endif
+    return t;
+  }();
+  return tables;
+}
 
 const simd::family_tables<sql_kernels>& sql_tables() noexcept { return kTables; }
 const sql_kernels& machine_sql_kernels() noexcept { return simd::active(kTables, active_kernels); }

@@ -7,6 +7,7 @@
 #include <string>
 #include <string_view>
 
+#include "common/out_buffer.h"
 #include "encodings/sql_kernels.h"
 
 namespace zul::encodings {
@@ -14,7 +15,9 @@ namespace zul::encodings {
 // Decodes backslash escapes: \0 \' \" \b \n \r \t \Z \\ \% \_ (letters
 // case-sensitive) give one byte; a backslash before any other byte keeps
 // both bytes; a final backslash is kept. Output is at most in.size().
-std::string decode_mysql(std::string_view in);
+// Throws std::bad_alloc when memory runs out. level picks the block kernel
+// (where it has one).
+out_buffer decode_mysql(std::string_view in, simd::isa level = simd::best_isa());
 
 // Rewrites "true" as "1" and "false" as "0" where the word starts after a
 // separator (or at the start), is followed by a separator, at least five

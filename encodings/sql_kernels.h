@@ -4,6 +4,7 @@
 // chosen once per process.
 #pragma once
 
+#include <array>
 #include <cstddef>
 #include <cstdint>
 
@@ -51,6 +52,36 @@ const sql_kernels& machine_sql_kernels() noexcept;
 inline const sql_kernels& sql_kernels_for(simd::isa level) noexcept {
   return simd::kernels_for(sql_tables(), level);
 }
+
+// Block kernel of MySQL unescaping: decodes whole blocks of in[0, n) into
+// out (room for n bytes), never stopping between a backslash and the byte
+// it escapes. Returns the bytes consumed; *written is the bytes written.
+// Null where the level has none (the memchr loop of sql.cpp does all).
+// The byte each MySQL escape letter stands for; 0xFFFF: no escape.
+inline constexpr std::array<std::uint16_t, 256> kMySQLEscapes = [] {
+  std::array<std::uint16_t, 256> table{};
+  for (auto& entry : table) entry = 0xFFFF;
+  table['0'] = 0;
+  table['\''] = '\'';
+  table['"'] = '"';
+  table['b'] = 8;
+  table['n'] = '\n';
+  table['r'] = '\r';
+  table['t'] = '\t';
+  table['Z'] = 26;
+  table['\\'] = '\\';
+  table['%'] = '%';
+  table['_'] = '_';
+  return table;
+}();
+
+struct mysql_kernels {
+  std::size_t (*unescape)(const std::uint8_t* in, std::size_t n, std::uint8_t* out,
+                          std::size_t* written) noexcept;
+};
+const simd::family_tables<mysql_kernels>& mysql_tables() noexcept;
+std::size_t unescape_mysql_avx512_vbmi2(const std::uint8_t* in, std::size_t n, std::uint8_t* out,
+                                        std::size_t* written) noexcept;
 
 std::size_t find_boolean_candidate_scalar(const std::uint8_t* p, std::size_t n) noexcept;
 std::size_t find_boolean_candidate_avx2(const std::uint8_t* p, std::size_t n) noexcept;

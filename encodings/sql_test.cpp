@@ -6,7 +6,9 @@
 #include <string>
 #include <string_view>
 
+#include "common/cpu.h"
 #include "tests/reference/sql_reference.h"
+#include "tests/sweep.h"
 
 namespace zul::encodings {
 namespace {
@@ -33,7 +35,25 @@ TEST(decode_mysql, escapes) {
   };
   for (const auto& row : rows) {
     SCOPED_TRACE(row.why);
-    EXPECT_EQ(decode_mysql(row.in), row.want);
+    EXPECT_EQ(reference::decode_mysql_reference(row.in), row.want);
+    for (const simd::isa level : simd::supported_isas())
+      EXPECT_EQ(decode_mysql(row.in, level), row.want);
+  }
+}
+
+// Backslashes (runs of them included), escape letters and other bytes at
+// every position across block edges, and every byte after a backslash.
+TEST(decode_mysql, every_level_with_an_escape_everywhere) {
+  for (const simd::isa level : simd::supported_isas()) {
+    SCOPED_TRACE(simd::isa_name(level));
+    const auto check = [&](const std::string& in) {
+      ASSERT_EQ(decode_mysql(in, level), reference::decode_mysql_reference(in));
+      ASSERT_EQ(decode_mysql("\\" + in, level), reference::decode_mysql_reference("\\" + in));
+    };
+    testing_sweep::special_byte_sweep("\\n\xE9", 2 * 64 + 3, check);
+    std::string every = testing_sweep::every_byte_value();
+    for (std::size_t k = 0; k < every.size(); k += 3) every[k] = '\\';
+    check(every);
   }
 }
 

@@ -96,10 +96,12 @@ extern "C" int LLVMFuzzerTestOneInput(const std::uint8_t* data, std::size_t size
       break;
     }
     default:
-      (void)enc::decode_mysql(in);
+      for (const zul::simd::isa level : zul::simd::supported_isas()) {
+        check(enc::decode_mysql(in, level) == zul::reference::decode_mysql_reference(in));
+      }
       for (const zul::simd::isa level : zul::simd::supported_isas()) {
         const std::string_view with = options & 1 ? "?" : "";
-        check(enc::remove_html_tags(in, with, zul::kMaxResultBytes, zul::scan_for(level)) ==
+        check(enc::remove_html_tags(in, with, zul::kMaxResultBytes, level) ==
               zul::reference::remove_html_tags_reference(in, with));
       }
       for (const zul::simd::isa level : zul::simd::supported_isas()) {

@@ -1,11 +1,13 @@
 // ISO 8859-1 / Windows-1252 conversion cores. Both directions run the
-// machine's block kernels (latin1_x86.cpp) straight into the locked handle,
-// sized once, and finish the tail with the scalar level here: one table
-// look-up per byte when decoding; when encoding, ASCII words and then a
-// reverse map derived at compile time from the same table (lowest byte
-// first, as a search from index 0 would find, two look-ups per unit);
-// tests compare it with a plain table search
-// (tests/reference/latin1_reference.h).
+// machine's block kernels (latin1_x86.cpp; the AVX-512 encoder with VBMI2
+// in latin1_vbmi2.cpp) straight into the locked handle, sized once, and
+// finish the tail with the scalar level here: one table look-up per byte
+// when decoding; when encoding, ASCII words and then a reverse map derived
+// at compile time from the same table (lowest byte first, as a search from
+// index 0 would find, two look-ups per unit); tests compare it with a plain
+// table search (tests/reference/latin1_reference.h). The vector kernels find
+// the units from 0x100 up that a set holds through a perfect hash derived
+// here too.
 #include "text/latin1.h"
 
 #include <algorithm>
@@ -19,8 +21,41 @@
 namespace zul::text {
 namespace {
 
+constexpr unsigned hash_slot(std::uint16_t unit, std::uint16_t multiplier) {
+  return static_cast<std::uint16_t>(unit * multiplier) >> 10;
+}
+
+// Fills the hash of the units from 0x100 up with the smallest odd
+// multiplier that gives each of them a slot of its own (the lowest byte
+// wins where two bytes hold the same unit). A table for which there is none
+// does not compile.
+constexpr void derive_hash(const charset_table& table, single_byte_charset& set) {
+  bool any = false;
+  for (const std::uint16_t unit : table) any = any || unit >= 0x100;
+  if (!any) return;
+  for (unsigned m = 1; m < 0x10000; m += 2) {
+    const auto multiplier = static_cast<std::uint16_t>(m);
+    set.hash_units.fill(0);
+    bool clash = false;
+    for (int k = 0; k < 256 && !clash; ++k) {
+      const std::uint16_t unit = table[k];
+      if (unit < 0x100) continue;
+      const unsigned slot = hash_slot(unit, multiplier);
+      if (set.hash_units[slot] == unit) continue;
+      clash = set.hash_units[slot] != 0;
+      set.hash_units[slot] = unit;
+      set.hash_bytes[slot] = static_cast<std::uint16_t>(k);
+    }
+    if (!clash) {
+      set.hash_multiplier = multiplier;
+      return;
+    }
+  }
+  throw std::length_error("no perfect hash");
+}
+
 constexpr single_byte_charset derive_charset(const charset_table& table) {
-  single_byte_charset set{&table, {}, {}, true};
+  single_byte_charset set{&table, {}, {}, true, 0, {}, {}};
   for (auto& row : set.rows) row.fill(-1);
   set.row_of[0] = 1;
   std::size_t rows = 2;
@@ -34,6 +69,7 @@ constexpr single_byte_charset derive_charset(const charset_table& table) {
     set.rows[set.row_of[high]][table[k] & 0xFF] = static_cast<std::int16_t>(k);
   }
   for (int k = 0; k < 0x80; ++k) set.ascii_identity = set.ascii_identity && set.low(k) == k;
+  derive_hash(table, set);
   return set;
 }
 
@@ -111,13 +147,17 @@ static_assert(derive_charset(escapecharsISO8859).ascii_identity &&
               derive_charset(escapecharsCP1252).ascii_identity);
 
 const simd::family_tables<single_byte_kernels>& single_byte_tables() noexcept {
+  // Built once: the AVX-512 encoder compresses with VBMI2 where it has it.
+  static const simd::family_tables<single_byte_kernels> tables = [] {
+    simd::family_tables<single_byte_kernels> t{&kScalarKernels};
 #if defined(__x86_64__)
-  static constexpr simd::family_tables<single_byte_kernels> tables{
-      &kScalarKernels, &detail::kSingleByteSse2, &detail::kSingleByteAvx2,
-      &detail::kSingleByteAvx512};
-#else
-  static constexpr simd::family_tables<single_byte_kernels> tables{&kScalarKernels};
+    t.sse2 = &detail::kSingleByteSse2;
+    t.avx2 = &detail::kSingleByteAvx2;
+    t.avx512 =
+        simd::has_avx512_vbmi2() ? &detail::kSingleByteAvx512Vbmi2 : &detail::kSingleByteAvx512;
 #endif
+    return t;
+  }();
   return tables;
 }
 

@@ -53,6 +53,13 @@ struct single_byte_charset {
   std::array<std::uint8_t, 256> row_of;                   // high byte -> row (0: none held)
   std::array<std::array<std::int16_t, 256>, kRows> rows;  // low byte -> byte, -1: none
   bool ascii_identity;                                    // units below 0x80 encode to themselves
+  // The units from 0x100 up that the set holds, by a perfect hash for the
+  // vector kernels: slot ((unit * hash_multiplier) & 0xFFFF) >> 10 holds
+  // the unit (0 when the slot is free) and its byte. hash_multiplier is 0
+  // when the set holds no such unit.
+  std::uint16_t hash_multiplier;
+  std::array<std::uint16_t, 64> hash_units;
+  std::array<std::uint16_t, 64> hash_bytes;
   // The byte for a unit below 0x100, or -1.
   constexpr int low(std::uint16_t unit) const { return rows[1][unit & 0xFF]; }
 };

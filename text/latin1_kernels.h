@@ -33,6 +33,8 @@ const single_byte_kernels& single_byte_active() noexcept;
 
 namespace detail {
 extern const single_byte_kernels kSingleByteSse2, kSingleByteAvx2, kSingleByteAvx512;
+// The AVX-512 decoder with an encoder that needs VBMI and VBMI2.
+extern const single_byte_kernels kSingleByteAvx512Vbmi2;
 }  // namespace detail
 
 }  // namespace zul::text

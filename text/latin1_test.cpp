@@ -37,8 +37,23 @@ std::span<const std::uint16_t> span_of(std::u16string_view s) {
   return {reinterpret_cast<const std::uint16_t*>(s.data()), s.size()};
 }
 
-const single_byte_kernels& kernels(zul::simd::isa level) {
-  return zul::simd::kernels_for(single_byte_tables(), level);
+struct named_kernels {
+  const single_byte_kernels* kernels;
+  const char* name;
+};
+
+// Every level the machine has and, where AVX-512 has VBMI2, also the
+// AVX-512 kernels without it (the fallback of machines that lack it).
+std::vector<named_kernels> every_kernel() {
+  std::vector<named_kernels> all;
+  for (const zul::simd::isa level : zul::simd::supported_isas()) {
+    all.push_back(
+        {&zul::simd::kernels_for(single_byte_tables(), level), zul::simd::isa_name(level)});
+  }
+#if defined(__x86_64__)
+  if (zul::simd::has_avx512_vbmi2()) all.push_back({&detail::kSingleByteAvx512, "avx512 no vbmi2"});
+#endif
+  return all;
 }
 
 struct named_set {
@@ -77,19 +92,19 @@ TEST(encode_single_byte, fast_path_matches_reference_on_random_texts) {
     const std::span<const std::uint16_t> units(text.data() + offset, length);
     for (const auto& s : kSets) {
       const std::string want = zul::reference::encode_single_byte_reference(units, s.table);
-      for (const zul::simd::isa level : zul::simd::supported_isas()) {
-        ASSERT_EQ(bytes_of(encode_single_byte(units, s.set, kHandleLimit, kernels(level))), want)
-            << s.name << " " << zul::simd::isa_name(level) << " round " << round;
+      for (const auto& [k, name] : every_kernel()) {
+        ASSERT_EQ(bytes_of(encode_single_byte(units, s.set, kHandleLimit, *k)), want)
+            << s.name << " " << name << " round " << round;
       }
     }
   }
 }
 // Every unit that needs the table (kept, mapped or dropped) at every
-// position of every length up to three blocks of the widest kernel, in
+// position of every length up to two blocks of the widest kernel and a tail, in
 // text that is otherwise plain Latin-1, on every kernel level.
 TEST(encode_single_byte, special_unit_at_every_position_on_every_kernel) {
   const std::uint16_t specials[] = {0x80, 0x81, 0x9F, 0xA0, 0x100, 0x20AC, 0x2122, 0xD800, 0xFFFF};
-  for (std::size_t length = 1; length <= 3 * 32 + 1; ++length) {
+  for (std::size_t length = 1; length <= 2 * 64 + 1; ++length) {
     std::vector<std::uint16_t> text(length);
     for (std::size_t k = 0; k < length; ++k)
       text[k] = static_cast<std::uint16_t>("ab\xE9 Z"[k % 5] & 0xFF);
@@ -107,14 +122,13 @@ TEST(encode_single_byte, special_unit_at_every_position_on_every_kernel) {
           const bool with_pair = at % 3 == 0;
           const std::string want_pair =
               with_pair ? zul::reference::encode_single_byte_reference(pair, s.table) : "";
-          for (const zul::simd::isa level : zul::simd::supported_isas()) {
-            ASSERT_EQ(bytes_of(encode_single_byte(in, s.set, kHandleLimit, kernels(level))), want)
-                << s.name << " " << zul::simd::isa_name(level) << " length " << length << " at "
-                << at << " unit " << special;
+          for (const auto& [k, name] : every_kernel()) {
+            ASSERT_EQ(bytes_of(encode_single_byte(in, s.set, kHandleLimit, *k)), want)
+                << s.name << " " << name << " length " << length << " at " << at << " unit "
+                << special;
             if (!with_pair) continue;
-            ASSERT_EQ(bytes_of(encode_single_byte(pair, s.set, kHandleLimit, kernels(level))),
-                      want_pair)
-                << s.name << " " << zul::simd::isa_name(level) << " pair at " << at;
+            ASSERT_EQ(bytes_of(encode_single_byte(pair, s.set, kHandleLimit, *k)), want_pair)
+                << s.name << " " << name << " pair at " << at;
           }
         }
       }
@@ -129,13 +143,13 @@ TEST(decode_single_byte, every_byte_at_every_position_on_every_kernel) {
       std::string in(length, 'q');
       for (std::size_t k = value % 3; k < length; k += 3) in[k] = static_cast<char>(value);
       for (const auto& s : kSets) {
-        for (const zul::simd::isa level : zul::simd::supported_isas()) {
+        for (const auto& [k, name] : every_kernel()) {
           const std::u16string units =
-              units_of(decode_single_byte(zul::bytes_of(in), s.set, kHandleLimit, kernels(level)));
+              units_of(decode_single_byte(zul::bytes_of(in), s.set, kHandleLimit, *k));
           ASSERT_EQ(units.size(), length);
           for (std::size_t k = 0; k < length; ++k) {
             ASSERT_EQ(units[k], s.table[static_cast<std::uint8_t>(in[k])])
-                << s.name << " " << zul::simd::isa_name(level) << " value " << value;
+                << s.name << " " << name << " value " << value;
           }
         }
       }

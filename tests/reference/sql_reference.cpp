@@ -27,6 +27,24 @@ bool spells(const char* p, std::string_view word) {
 
 }  // namespace
 
+std::string decode_mysql_reference(std::string_view in) {
+  static constexpr std::string_view kLetters("0'\"bnrtZ\\%_", 11),
+      kBytes("\0'\"\b\n\r\t\x1A\\%_", 11);
+  std::string out;
+  for (std::size_t i = 0; i < in.size(); ++i) {
+    const std::size_t k =
+        i + 1 < in.size() && in[i] == '\\' ? kLetters.find(in[i + 1]) : kLetters.npos;
+    if (k == kLetters.npos) {
+      out += in[i];
+      if (in[i] == '\\' && i + 1 < in.size()) out += in[++i];  // not an escape: both kept
+    } else {
+      out += kBytes[k];
+      ++i;
+    }
+  }
+  return out;
+}
+
 std::string replace_sql_booleans_reference(std::string_view utf8) {
   const std::size_t n = utf8.size();
   std::string out;

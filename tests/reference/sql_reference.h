@@ -7,6 +7,9 @@
 
 namespace zul::reference {
 
+// MySQL backslash escapes undone one byte at a time.
+std::string decode_mysql_reference(std::string_view in);
+
 std::string replace_sql_booleans_reference(std::string_view utf8);
 
 }  // namespace zul::reference
