@@ -155,6 +155,8 @@ const simd::family_tables<single_byte_kernels>& single_byte_tables() noexcept {
     t.avx2 = &detail::kSingleByteAvx2;
     t.avx512 =
         simd::has_avx512_vbmi2() ? &detail::kSingleByteAvx512Vbmi2 : &detail::kSingleByteAvx512;
+#elif defined(__aarch64__)
+    t.neon = &detail::kSingleByteNeon;
 #endif
     return t;
   }();

@@ -35,6 +35,8 @@ namespace detail {
 extern const single_byte_kernels kSingleByteSse2, kSingleByteAvx2, kSingleByteAvx512;
 // The AVX-512 decoder with an encoder that needs VBMI and VBMI2.
 extern const single_byte_kernels kSingleByteAvx512Vbmi2;
+// The arm64 kernels.
+extern const single_byte_kernels kSingleByteNeon;
 }  // namespace detail
 
 }  // namespace zul::text
