@@ -95,16 +95,25 @@ void rbText::reset_slot(Slot slot) {
   lengths_[slot] = 0;
 }
 
+namespace {
+
+// A buffer for units of the given size, with four spare units after them
+// set to zero (a terminating zero unit, and then some); the units themselves
+// are left for the caller to write, not zero-filled first. Null when the
+// count has no buffer size or a signed length cannot hold it (it may come
+// from a length the host reports), or when memory runs out.
+void* allocate_units(std::size_t units, std::size_t unit) {
+  if (units > SIZE_MAX / unit - 4 || units > static_cast<std::uint64_t>(INT64_MAX)) return nullptr;
+  void* buffer = std::malloc((units + 4) * unit);
+  if (buffer) std::memset(static_cast<char*>(buffer) + units * unit, 0, 4 * unit);
+  return buffer;
+}
+
+}  // namespace
+
 bool rbText::take_copy(Slot slot, const void* src, std::size_t units, std::size_t unit) {
   reset_slot(slot);
-  // units comes from a length the host reports: a count whose buffer (with
-  // four spare units) has no size, or that a signed length cannot hold, is
-  // a failed allocation.
-  void* buffer = nullptr;
-  if (units <= SIZE_MAX / unit - 4 && units <= static_cast<std::uint64_t>(INT64_MAX)) {
-    // Zero-filled with room for a terminating zero unit (and then some).
-    buffer = std::calloc(units + 4, unit);
-  }
+  void* buffer = allocate_units(units, unit);
   if (!buffer) {
     out_of_memory_ = true;
     return false;
@@ -120,11 +129,7 @@ template <class Unit>
 void rbText::widen_ascii(Slot slot) {
   const std::int64_t n = LengthASCII();
   if (n < 1) return;
-  // Room for a terminating zero unit and then some; calloc checks the
-  // product of count and unit size.
-  const auto count = static_cast<std::uint64_t>(n);
-  if (count > SIZE_MAX - 4) return;
-  auto* wide = static_cast<Unit*>(std::calloc(static_cast<std::size_t>(count) + 4, sizeof(Unit)));
+  auto* wide = static_cast<Unit*>(allocate_units(static_cast<std::size_t>(n), sizeof(Unit)));
   if (!wide) {
     out_of_memory_ = true;
     return;
@@ -223,7 +228,7 @@ void rbText::derive_utf32_from_utf16() {
   const std::int64_t n = lengths_[kUTF16];
   if (n < 1) return;
   // n is at most the UTF-16 slot's unit count, which take_copy bounded.
-  auto* out = static_cast<std::uint32_t*>(std::calloc(static_cast<std::size_t>(n) + 4, 4));
+  auto* out = static_cast<std::uint32_t*>(allocate_units(static_cast<std::size_t>(n), 4));
   if (!out) {
     out_of_memory_ = true;
     return;
@@ -240,6 +245,8 @@ void rbText::derive_utf32_from_utf16() {
       out[count++] = unit;  // ordinary unit, or an unpaired surrogate kept as is
     }
   }
+  // Pairs made fewer code points than units: zeros from the terminator on.
+  std::memset(out + count, 0, static_cast<std::size_t>(n - count) * 4);
   owned_[kUTF32] = out;
   pointers_[kUTF32] = out;
   lengths_[kUTF32] = count;
