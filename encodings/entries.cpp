@@ -86,11 +86,21 @@ REALstring DecodingToURL1(REALstring s) noexcept { return DecodingToURL2(s, 0); 
 // HTML character references over the string's code points.
 REALstring EncodingToHTML(REALstring s, std::int64_t options) noexcept {
   if (!s) return nullptr;
-  return trapped<REALstring>(nullptr, [&] {
-    return with_code_points(s, [&](enc::code_point_view chars) {
-      if (!enc::html_needs_escaping(chars)) return same_string(s);
-      return build_string(enc::encode_html(chars, options), kASCII);
-    });
+  return trapped<REALstring>(nullptr, [&]() -> REALstring {
+    rbText text(s);
+    if (text.is_ascii()) {
+      // ASCII text is its own code points: no widening to UTF-32 first.
+      const zul::bytes_view ascii(reinterpret_cast<const std::uint8_t*>(text.GetASCII()),
+                                  static_cast<std::size_t>(text.LengthASCII()));
+      if (ascii.empty()) return nullptr;
+      if (!enc::ascii_html_needs_escaping(ascii)) return same_string(s);
+      return build_string(enc::encode_ascii_html(ascii, options), kASCII);
+    }
+    text.ConvertUTF32();
+    const auto chars = text.utf32();
+    if (chars.empty()) return nullptr;
+    if (!enc::html_needs_escaping(chars)) return same_string(s);
+    return build_string(enc::encode_html(chars, options), kASCII);
   });
 }
 

@@ -178,13 +178,31 @@ bool html_needs_escaping(code_point_view text) {
          text.size();
 }
 
-out_buffer encode_html(code_point_view text, std::int64_t options, std::uint64_t limit,
-                       const scan_kernels& scan) {
-  text = skip_byte_order_mark(text);
+namespace {
+
+// Copies the run of text before the first member of work to out, as bytes
+// (code points narrowed to min(c, 255)); returns its length. out has room
+// for n + 64 bytes.
+std::size_t copy_run(const scan_kernels& scan, const simd::byte_set& work, const std::uint32_t* p,
+                     std::size_t n, std::uint8_t* out) {
+  return scan.narrow_until_member(work, p, n, out);
+}
+std::size_t copy_run(const scan_kernels& scan, const simd::byte_set& work, const std::uint8_t* p,
+                     std::size_t n, std::uint8_t* out) {
+  const std::size_t run = scan.find_first(work, p, n);
+  if (run != 0) std::memcpy(out, p, run);
+  return run;
+}
+
+// The encoder over code points, or over ASCII bytes (which are their own
+// code points).
+template <class Unit>
+out_buffer encode_html_units(std::span<const Unit> text, std::int64_t options, std::uint64_t limit,
+                             const scan_kernels& scan) {
   const bool keep_markup = (options & 1) != 0;
   const ascii_actions& actions = keep_markup ? kKeepMarkup : kEscapeMarkup;
   const simd::byte_set& work = keep_markup ? kEncodeWorkKeepMarkup : kEncodeWork;
-  const std::uint32_t* p = text.data();
+  const Unit* p = text.data();
   const std::size_t n = text.size();
   // Typical text grows little; the buffer grows (rarely) for more.
   out_buffer out(worst_case_reserve(n, 1, n / 8 + 64, limit), limit);
@@ -193,7 +211,7 @@ out_buffer encode_html(code_point_view text, std::int64_t options, std::uint64_t
   while (i < n) {
     const std::size_t chunk = n - i < kChunk ? n - i : kChunk;
     if (!out.ensure(chunk + 64)) return out.discard();
-    const std::size_t run = scan.narrow_until_member(work, p + i, chunk, out.tail());
+    const std::size_t run = copy_run(scan, work, p + i, chunk, out.tail());
     out.commit(run);
     i += run;
     if (run == chunk) continue;
@@ -207,6 +225,22 @@ out_buffer encode_html(code_point_view text, std::int64_t options, std::uint64_t
   }
   if (!out.fits()) return out.discard();
   return out;
+}
+
+}  // namespace
+
+out_buffer encode_html(code_point_view text, std::int64_t options, std::uint64_t limit,
+                       const scan_kernels& scan) {
+  return encode_html_units(skip_byte_order_mark(text), options, limit, scan);
+}
+
+bool ascii_html_needs_escaping(bytes_view ascii) {
+  return simd::find_first_in_set(kNeedsEscaping, ascii) != ascii.size();
+}
+
+out_buffer encode_ascii_html(bytes_view ascii, std::int64_t options, std::uint64_t limit,
+                             const scan_kernels& scan) {
+  return encode_html_units(ascii, options, limit, scan);
 }
 
 }  // namespace zul::encodings

@@ -11,6 +11,7 @@
 #include <string>
 #include <vector>
 
+#include "common/bytes.h"
 #include "common/out_buffer.h"
 #include "common/scan.h"
 #include "common/size_gate.h"
@@ -40,6 +41,13 @@ bool html_needs_escaping(code_point_view text);
 out_buffer encode_html(code_point_view text, std::int64_t options,
                        std::uint64_t limit = kMaxResultBytes,
                        const scan_kernels& scan = machine_scan());
+
+// The same two for ASCII text given as its bytes (the code points of ASCII
+// text), which saves widening it to code points first.
+bool ascii_html_needs_escaping(bytes_view ascii);
+out_buffer encode_ascii_html(bytes_view ascii, std::int64_t options,
+                             std::uint64_t limit = kMaxResultBytes,
+                             const scan_kernels& scan = machine_scan());
 
 // Decodes references: "&" + name + ";" with a name of 1 to 8 characters (at
 // the very end of the text the ";" may be missing). A name of the table

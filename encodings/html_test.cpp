@@ -5,6 +5,7 @@
 
 #include <gtest/gtest.h>
 
+#include <algorithm>
 #include <random>
 #include <string>
 
@@ -133,9 +134,16 @@ TEST(markup_codecs, every_kernel_matches_the_references) {
     SCOPED_TRACE(simd::isa_name(level));
     const scan_kernels& scan = scan_for(level);
     const auto check = [&](const code_points& in) {
+      const bool ascii =
+          std::all_of(in.begin(), in.end(), [](std::uint32_t c) { return c < 0x80; });
+      const std::vector<std::uint8_t> bytes(in.begin(), in.end());
       for (const std::int64_t options : {0, 1}) {
         ASSERT_EQ(encode_html(in, options, kMaxResultBytes, scan),
                   zul::reference::encode_html_reference(in, options));
+        if (ascii) {
+          ASSERT_EQ(encode_ascii_html(bytes, options, kMaxResultBytes, scan),
+                    zul::reference::encode_html_reference(in, options));
+        }
         ASSERT_EQ(encode_xml(in, options, kMaxResultCodePoints, scan),
                   zul::reference::encode_xml_reference(in, options));
       }
