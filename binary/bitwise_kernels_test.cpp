@@ -8,6 +8,8 @@
 #include <random>
 #include <vector>
 
+#include "tests/sweep.h"
+
 namespace zul::binary::detail {
 namespace {
 
@@ -16,9 +18,7 @@ TEST(bitwise_kernels, runs_match_the_scalar_run) {
   std::vector<std::uint8_t> a(64 + 3 * 128), b(a.size());
   for (auto& x : a) x = static_cast<std::uint8_t>(rng());
   for (auto& x : b) x = static_cast<std::uint8_t>(rng());
-  for (simd::isa level : simd::supported_isas()) {
-    SCOPED_TRACE(simd::isa_name(level));
-    const bitwise_kernels& k = kernels_for(bitwise_tables(), level);
+  testing_sweep::for_each_kernel(bitwise_tables(), [&](const bitwise_kernels& k) {
     for (int op = 0; op < 3; ++op) {
       for (std::size_t align = 0; align < 64; align += 5) {
         for (std::size_t n = 0; n <= 3 * 128; ++n) {
@@ -32,7 +32,7 @@ TEST(bitwise_kernels, runs_match_the_scalar_run) {
         }
       }
     }
-  }
+  });
 }
 
 }  // namespace

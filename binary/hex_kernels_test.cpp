@@ -9,16 +9,12 @@
 #include <string>
 #include <vector>
 
+#include "tests/sweep.h"
+
 namespace zul::binary::detail {
 namespace {
 
-template <class Body>
-void for_each_kernel(Body body) {
-  for (simd::isa level : simd::supported_isas()) {
-    SCOPED_TRACE(simd::isa_name(level));
-    body(kernels_for(hex_tables(), level));
-  }
-}
+using testing_sweep::for_each_kernel;
 
 TEST(hex_kernels, every_byte_and_every_character_pair) {
   std::vector<std::uint8_t> bytes(256 * 3);
@@ -34,7 +30,7 @@ TEST(hex_kernels, every_byte_and_every_character_pair) {
   }
   std::vector<std::uint8_t> want_bytes(65536);
   decode_hex_scalar(pairs.data(), 65536, want_bytes.data());
-  for_each_kernel([&](const hex_kernels& k) {
+  for_each_kernel(hex_tables(), [&](const hex_kernels& k) {
     std::string got(want.size(), '?');
     k.encode(bytes.data(), bytes.size(), got.data());
     EXPECT_EQ(got, want);
@@ -51,7 +47,7 @@ TEST(hex_kernels, length_sweep_at_every_misalignment) {
   for (auto& b : in) b = static_cast<std::uint8_t>(rng());
   std::string text(in.size(), ' ');
   for (char& c : text) c = alphabet[rng() % alphabet.size()];
-  for_each_kernel([&](const hex_kernels& k) {
+  for_each_kernel(hex_tables(), [&](const hex_kernels& k) {
     for (std::size_t align = 0; align < 64; align += 3) {
       for (std::size_t n = 0; n <= 3 * 64; ++n) {
         std::string want(2 * n + 2, '#'), got(2 * n + 2, '#');

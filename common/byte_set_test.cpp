@@ -8,22 +8,19 @@
 #include <random>
 #include <vector>
 
+#include "tests/sweep.h"
+
 namespace zul::simd {
 namespace {
+
+using testing_sweep::for_each_kernel;
+const auto& kTables = detail::byte_set_tables();
 
 std::size_t model(const std::vector<std::uint8_t>& members, const std::uint8_t* p, std::size_t n) {
   for (std::size_t i = 0; i < n; ++i) {
     if (std::find(members.begin(), members.end(), p[i]) != members.end()) return i;
   }
   return n;
-}
-
-template <class Body>
-void for_each_kernel(Body body) {
-  for (isa level : supported_isas()) {
-    SCOPED_TRACE(isa_name(level));
-    body(kernels_for(detail::byte_set_tables(), level));
-  }
 }
 
 TEST(byte_set, membership_of_all_256_values) {
@@ -45,7 +42,7 @@ TEST(byte_set, membership_of_all_256_values) {
 TEST(find_first_in_set, every_single_byte_set) {
   std::vector<std::uint8_t> buf(512);
   for (std::size_t i = 0; i < buf.size(); ++i) buf[i] = static_cast<std::uint8_t>(i * 7 + 3);
-  for_each_kernel([&](const detail::byte_set_kernels& k) {
+  for_each_kernel(kTables, [&](const auto& k) {
     for (int member = 0; member < 256; ++member) {
       const std::vector<std::uint8_t> members{static_cast<std::uint8_t>(member)};
       const byte_set set = make_byte_set(members);
@@ -74,7 +71,7 @@ TEST(find_first_in_set, length_and_alignment_sweep) {
         return all;
       }()};
   std::vector<std::uint8_t> buf(192 + 64 + 64);
-  for_each_kernel([&](const detail::byte_set_kernels& k) {
+  for_each_kernel(kTables, [&](const auto& k) {
     for (const auto& members : sets) {
       const byte_set set = make_byte_set(members);
       // Filler: a byte outside the set.
@@ -111,7 +108,7 @@ TEST(find_first_in_set, random_sets_and_buffers_agree_with_the_model) {
     const byte_set set = make_byte_set(members);
     const std::size_t want = model(members, buf.data(), buf.size());
     EXPECT_EQ(find_first_in_set(set, buf), want);
-    for_each_kernel([&](const detail::byte_set_kernels& k) {
+    for_each_kernel(kTables, [&](const auto& k) {
       ASSERT_EQ(k.find_first(set, buf.data(), buf.size()), want);
     });
   }
@@ -135,7 +132,7 @@ TEST(find_first_in_set, sets_of_ranges_agree_with_membership) {
     for (auto& c : buf) c = static_cast<std::uint8_t>(rng());
     const std::size_t n = rng() % buf.size();
     const std::size_t want = detail::find_first_in_set_scalar(set, buf.data(), n);
-    for_each_kernel([&](const detail::byte_set_kernels& k) {
+    for_each_kernel(kTables, [&](const auto& k) {
       ASSERT_EQ(k.find_first(set, buf.data(), n), want) << "round " << round;
     });
   }
@@ -143,8 +140,7 @@ TEST(find_first_in_set, sets_of_ranges_agree_with_membership) {
 
 TEST(find_first_in_set, empty_range_and_null_pointer) {
   const byte_set set = make_byte_set(bytes_of("ab"));
-  for_each_kernel(
-      [&](const detail::byte_set_kernels& k) { EXPECT_EQ(k.find_first(set, nullptr, 0), 0u); });
+  for_each_kernel(kTables, [&](const auto& k) { EXPECT_EQ(k.find_first(set, nullptr, 0), 0u); });
 }
 
 // Code-point lanes: every byte value and the saturating values above it, at
@@ -162,7 +158,7 @@ TEST(find_first_code_point, lanes_saturate_at_255_on_every_kernel) {
   byte_set markup = make_byte_set(bytes_of("&<>\"'\x01"));
   byte_set high = markup;
   high.add_range(0x80, 0xFF);
-  for_each_kernel([&](const detail::byte_set_kernels& k) {
+  for_each_kernel(kTables, [&](const auto& k) {
     for (const byte_set* set : {&markup, &high}) {
       for (std::size_t n = 0; n <= 144; ++n) {
         std::vector<std::uint32_t> lanes(n + 1, 'a');

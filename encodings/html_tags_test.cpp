@@ -29,11 +29,8 @@ TEST(remove_html_tags, depth_rules) {
       {"a\0b<\0>c"sv, "-", "abc", "zero bytes vanish everywhere"},
       {"<p>\xC3\xA9</p>", "", "\xC3\xA9", "UTF-8 kept whole"},
       {"<unclosed", "#", "########", "to the end"},
-      {"<b>bold</b> text", "", "bold text", "simple tags"},
       {"a < b and x > d", "", "a  d", "text between brackets is a tag"},
       {"a<\xC3\xA9>b", "*", "a**b", "one replacement per byte inside"},
-      {"a<br>b", " ", "a  b", "two bytes inside, two replacements"},
-      {"\0"sv, "", "", "zero bytes are dropped"},
   };
   for (const auto& row : rows) {
     SCOPED_TRACE(row.why);

@@ -20,16 +20,16 @@ namespace {
 
 code_points cps(std::u32string_view text) { return {text.begin(), text.end()}; }
 
+// Markup in both modes, a Latin-1 row and an astral character are not
+// repeated here: the kernel sweep below checks them against the reference,
+// and encodings_e2e_test tables them end to end.
 TEST(encode_html, both_modes) {
   struct {
     std::u32string_view in;
     std::string_view want0, want1;
     const char* why;
   } rows[] = {
-      {U"Tom & Jerry's <b>", "Tom &amp; Jerry&#39;s &lt;b&gt;", "Tom & Jerry's <b>", "markup"},
       {U"\"", "&quot;", "\"", "double quote"},
-      {U"caf\u00E9", "caf&eacute;", "caf&eacute;", "Latin-1 row"},
-      {U"\U0001F600", "&#128512;", "&#128512;", "no row, astral"},
       {U"\u0100", "&#256;", "&#256;", "no row, BMP"},
       {U"\u03D1\u2283\u00A0\u00FF", "&thetasym;&sup;&nbsp;&yuml;", "&thetasym;&sup;&nbsp;&yuml;",
        "rows at both ends of Latin-1 and beyond"},

@@ -9,15 +9,14 @@
 #include <random>
 #include <vector>
 
+#include "tests/sweep.h"
+
 namespace zul::encodings::detail {
 namespace {
 
 template <class Body>
 void for_each_kernel(Body body) {
-  for (simd::isa level : simd::supported_isas()) {
-    SCOPED_TRACE(simd::isa_name(level));
-    body(kernels_for(yenc_tables(), level));
-  }
+  testing_sweep::for_each_kernel(yenc_tables(), body);
   if (!simd::has_avx512_vbmi2()) GTEST_LOG_(INFO) << "no AVX-512 VBMI2: its yEnc kernel not run";
 }
 

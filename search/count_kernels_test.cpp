@@ -10,8 +10,12 @@
 #include <string_view>
 #include <vector>
 
+#include "tests/sweep.h"
+
 namespace zul::search::detail {
 namespace {
+
+using testing_sweep::for_each_kernel;
 
 std::uint64_t model(const std::uint8_t* p, std::size_t n, std::string_view find) {
   const std::size_t m = find.size();
@@ -27,21 +31,13 @@ std::uint64_t model(const std::uint8_t* p, std::size_t n, std::string_view find)
   return count;
 }
 
-template <class Body>
-void for_each_kernel(Body body) {
-  for (simd::isa level : simd::supported_isas()) {
-    SCOPED_TRACE(simd::isa_name(level));
-    body(kernels_for(count_tables(), level));
-  }
-}
-
 TEST(count_byte, every_value_length_and_alignment) {
   std::mt19937 rng(3);
   std::vector<std::uint8_t> buf(2 * 64 + 3 * 256);
   for (auto& b : buf) b = static_cast<std::uint8_t>(rng() % 4 * 85);  // 0, 85, 170, 255
   // Offsets from a 64-byte boundary: the kernels align their rounds to one.
   const std::uint8_t* line = buf.data() + (-reinterpret_cast<std::uintptr_t>(buf.data()) & 63);
-  for_each_kernel([&](const count_kernels& k) {
+  for_each_kernel(count_tables(), [&](const count_kernels& k) {
     for (int v = 0; v < 256; ++v) {
       const auto b = static_cast<std::uint8_t>(v);
       for (std::size_t align : {0u, 1u, 31u, 32u, 33u, 63u}) {
@@ -57,32 +53,9 @@ TEST(count_byte, every_value_length_and_alignment) {
 TEST(count_byte, lane_counters_do_not_wrap) {
   // Every byte matches: each 8-bit lane counts up to its flush limit.
   const std::vector<std::uint8_t> same(255 * 128 * 3 + 77, 'x');
-  for_each_kernel([&](const count_kernels& k) {
+  for_each_kernel(count_tables(), [&](const count_kernels& k) {
     EXPECT_EQ(k.count_byte(same.data(), same.size(), 'x'), same.size());
     EXPECT_EQ(k.count_byte(same.data(), same.size(), 'y'), 0u);
-  });
-}
-
-TEST(count_pattern, non_overlapping_rows) {
-  struct {
-    std::string_view s, find;
-    std::uint64_t want;
-    const char* why;
-  } rows[] = {
-      {"aaaa", "aa", 2, "resumes after each match"},
-      {"aaa", "aa", 1, "no overlap"},
-      {"abab", "abab", 1, "whole input"},
-      {"aba", "abab", 0, "pattern longer than input"},
-      {"xaax", "aa", 1, "first and last byte equal"},
-  };
-  for_each_kernel([&](const count_kernels& k) {
-    for (const auto& row : rows) {
-      SCOPED_TRACE(row.why);
-      EXPECT_EQ(
-          k.count_pattern(reinterpret_cast<const std::uint8_t*>(row.s.data()), row.s.size(),
-                          reinterpret_cast<const std::uint8_t*>(row.find.data()), row.find.size()),
-          row.want);
-    }
   });
 }
 
@@ -100,7 +73,7 @@ TEST(count_pattern, random_strings_agree_with_the_model) {
     for (auto& c : find) c = static_cast<char>('a' + rng() % alphabet);
     const std::size_t align = rng() % 2;
     const std::uint64_t want = model(s.data() + align, n, find);
-    for_each_kernel([&](const count_kernels& k) {
+    for_each_kernel(count_tables(), [&](const count_kernels& k) {
       ASSERT_EQ(k.count_pattern(s.data() + align, n,
                                 reinterpret_cast<const std::uint8_t*>(find.data()), m),
                 want)

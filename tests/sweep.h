@@ -2,8 +2,11 @@
 // filler of every length up to a few vector widths with one special byte at
 // every position, and the same length made only of that byte, so that each
 // kernel meets the byte in every lane, at block edges and in the tail. Also
-// a UTF-8 model that decodes the code point, for the table-driven checkers.
+// a UTF-8 model that decodes the code point, for the table-driven checkers;
+// and the loop over every kernel level the machine runs.
 #pragma once
+
+#include <gtest/gtest.h>
 
 #include <cstddef>
 #include <cstdint>
@@ -11,7 +14,19 @@
 #include <string>
 #include <string_view>
 
+#include "common/dispatch.h"
+
 namespace zul::testing_sweep {
+
+// Calls body(kernels) with each level's kernels the machine runs, the
+// level named in any failure.
+template <class Table, class Body>
+void for_each_kernel(const simd::family_tables<Table>& tables, Body body) {
+  for (const simd::isa level : simd::supported_isas()) {
+    SCOPED_TRACE(simd::isa_name(level));
+    body(simd::kernels_for(tables, level));
+  }
+}
 
 // Calls check(input) for each input.
 template <class Check>

@@ -7,15 +7,15 @@
 
 #include <vector>
 
+#include "tests/sweep.h"
+
 namespace zul::text::detail {
 namespace {
 
 TEST(replace_non_printable_kernels, match_the_scalar_path) {
   std::vector<std::uint8_t> in(64 + 3 * 64 + 256);
   for (std::size_t i = 0; i < in.size(); ++i) in[i] = static_cast<std::uint8_t>(i * 37 + 11);
-  for (simd::isa level : simd::supported_isas()) {
-    SCOPED_TRACE(simd::isa_name(level));
-    const auto& k = kernels_for(char_class_tables(), level);
+  testing_sweep::for_each_kernel(char_class_tables(), [&](const char_class_kernels& k) {
     for (std::size_t align = 0; align < 64; ++align) {
       for (std::size_t n : {std::size_t{0}, std::size_t{1}, std::size_t{31}, std::size_t{32},
                             std::size_t{33}, std::size_t{63}, std::size_t{64}, std::size_t{65},
@@ -28,7 +28,7 @@ TEST(replace_non_printable_kernels, match_the_scalar_path) {
         }
       }
     }
-  }
+  });
 }
 
 }  // namespace

@@ -113,23 +113,17 @@ TEST(format_scientific, long_texts_are_cut_like_the_c_library) {
   EXPECT_EQ(format_scientific(1.0, 0x7FFFFFFF).size, 498u);
 }
 
-TEST(format_scientific, table) {
+// What the C library comparison above cannot reach: nan, whose sign the C
+// library prints, and digit counts outside 0..39 as the host passes them.
+TEST(format_scientific, nan_and_digit_counts) {
   const struct {
     double d;
     std::int64_t digits;
     std::string_view want;
     const char* why;
   } rows[] = {
-      {1234.5, 2, "1.23e+03", "rounded from the binary value"},
-      {1234.5, 0, "1e+03", "no point for 0 digits"},
-      {0.0, 3, "0.000e+00", "zero"},
-      {-0.0, 1, "-0.0e+00", "negative zero keeps its sign"},
-      {-kInf, 3, "-inf", "minus infinity"},
-      {kInf, 3, "inf", "infinity"},
       {std::nan(""), 3, "nan", "nan"},
       {-std::nan(""), 3, "nan", "a negative nan shows no sign"},
-      {9.96, 1, "1.0e+01", "carry into a new exponent"},
-      {5e-324, 2, "4.94e-324", "three exponent digits"},
       {1234.5, -3, "1.234500e+03", "negative digits give six"},
       {1234.5, 0x100000002, "1.23e+03", "digits taken as 32 bits"},
       {1234.5, 0xFFFFFFFF, "1.234500e+03", "-1 in 32 bits"},
