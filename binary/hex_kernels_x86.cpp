@@ -19,8 +19,7 @@
 #if defined(__x86_64__) || defined(_M_X64)
 #include <immintrin.h>
 
-#define ZUL_AVX2 __attribute__((target("avx2,bmi,bmi2")))
-#define ZUL_AVX512 __attribute__((target("avx2,bmi,bmi2,avx512f,avx512bw,avx512vl,avx512dq")))
+#include "common/targets.h"
 
 namespace zul::binary::detail {
 namespace {

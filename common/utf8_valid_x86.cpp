@@ -9,6 +9,7 @@
 #if defined(__x86_64__) || defined(_M_X64)
 #include <immintrin.h>
 
+#include "common/targets.h"
 #include "common/utf8_classes.h"
 #include "common/utf8_valid.h"
 
@@ -57,8 +58,6 @@ std::size_t copy_valid_sse2(const std::uint8_t* in, std::size_t n, std::uint8_t*
 }
 
 // ---- AVX2: 32-byte blocks ----
-
-#define ZUL_AVX2 __attribute__((target("avx2,bmi,bmi2")))
 
 // The 32 bytes before each byte of v, N back: from prev where they precede v.
 template <int N>
@@ -133,8 +132,6 @@ ZUL_AVX2 std::size_t copy_valid_avx2(const std::uint8_t* in, std::size_t n,
 }
 
 // ---- AVX-512: 64-byte blocks ----
-
-#define ZUL_AVX512 __attribute__((target("avx512f,avx512bw,avx512vl,avx512dq,avx2,bmi,bmi2")))
 
 template <int N>
 ZUL_AVX512 inline __m512i prev_avx512(__m512i v, __m512i prev) {

@@ -11,7 +11,7 @@
 #if defined(__x86_64__) || defined(_M_X64)
 #include <immintrin.h>
 
-#define ZUL_AVX2 __attribute__((target("avx2,bmi,bmi2")))
+#include "common/targets.h"
 
 namespace zul::encodings::detail {
 namespace {

@@ -15,10 +15,8 @@
 #if defined(__x86_64__) || defined(_M_X64)
 #include <immintrin.h>
 
+#include "common/targets.h"
 #include "encodings/yenc_pack.h"
-
-#define ZUL_SSSE3 __attribute__((target("ssse3")))
-#define ZUL_AVX2 __attribute__((target("avx2,bmi,bmi2")))
 
 namespace zul::encodings::detail {
 namespace {

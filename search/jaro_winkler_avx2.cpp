@@ -12,7 +12,7 @@
 
 #include <algorithm>
 
-#define ZUL_AVX2 __attribute__((target("avx2,bmi,bmi2,popcnt")))
+#include "common/targets.h"
 
 namespace zul::search::detail {
 namespace {

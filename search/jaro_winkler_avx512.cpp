@@ -17,12 +17,7 @@
 
 #include <algorithm>
 
-#define ZUL_AVX512 \
-  __attribute__((target("avx2,bmi,bmi2,popcnt,avx512f,avx512bw,avx512vl,avx512dq")))
-#define ZUL_AVX512_VBMI2                                                           \
-  __attribute__((                                                                  \
-      target("avx2,bmi,bmi2,popcnt,avx512f,avx512bw,avx512vl,avx512dq,avx512vbmi," \
-             "avx512vbmi2")))
+#include "common/targets.h"
 
 namespace zul::search::detail {
 namespace {
