@@ -10,6 +10,7 @@
 #if defined(__x86_64__) || defined(_M_X64)
 #include <immintrin.h>
 
+#include "common/targets.h"
 #include "text/latin1.h"
 
 namespace zul::text::detail {
@@ -161,8 +162,6 @@ std::size_t encode_sse2(const std::uint16_t* in, std::size_t n, std::uint8_t* ou
 
 // ---- AVX2: 32 bytes or 32 units a block ----
 
-#define ZUL_AVX2 __attribute__((target("avx2,bmi,bmi2,popcnt")))
-
 ZUL_AVX2 std::size_t decode_avx2(const std::uint8_t* in, std::size_t n, std::uint16_t* out,
                                  const std::uint16_t* c1) noexcept {
   std::size_t i = 0;
@@ -257,8 +256,6 @@ ZUL_AVX2 std::size_t encode_avx2(const std::uint16_t* in, std::size_t n, std::ui
 }
 
 // ---- AVX-512: 64 bytes or 32 units a block ----
-
-#define ZUL_AVX512 __attribute__((target("avx512f,avx512bw,avx512vl,avx512dq,avx2,bmi,bmi2")))
 
 ZUL_AVX512 std::size_t decode_avx512(const std::uint8_t* in, std::size_t n, std::uint16_t* out,
                                      const std::uint16_t* c1) noexcept {
