@@ -10,6 +10,7 @@
 #if defined(__x86_64__) || defined(_M_X64)
 #include <immintrin.h>
 
+#include "common/targets.h"
 #include "text/latin1.h"
 
 namespace zul::text::detail {
@@ -42,9 +43,32 @@ inline std::size_t encode_units(const std::uint16_t* in, std::size_t count, std:
 // from the first such lane k: a lone one takes the look-up and the next
 // block starts after it; with more than one, the rest of the block goes unit
 // by unit.
+// A set that keeps 80..9F and holds no unit from 0x100 up (ISO 8859-1)
+// drops every such lane, so they need no look-up: a block of nothing else is
+// skipped, a lone one is stepped over (the next block starts after it), and
+// otherwise the rest of the block keeps its units below 0x100.
 inline void finish_block(const std::uint16_t* in, std::uint8_t* out, unsigned m, unsigned block,
                          const single_byte_charset& set, bool patch, std::size_t& i,
                          std::size_t& o) {
+  if (!patch && set.hash_multiplier == 0) {
+    const unsigned k = static_cast<unsigned>(__builtin_ctz(m));
+    if ((m & (m - 1)) == 0) {
+      i += k + 1;
+      o += k;
+      return;
+    }
+    if (m == (block == 32 ? ~0u : (1u << block) - 1)) {
+      i += block;
+      return;
+    }
+    o += k;
+    for (std::size_t j = i + k; j < i + block; ++j) {
+      out[o] = static_cast<std::uint8_t>(in[j]);
+      o += in[j] < 0x100;
+    }
+    i += block;
+    return;
+  }
   if (patch && __builtin_popcount(m) <= 4) {
     std::uint8_t* const first = out + o;
     const std::uint16_t* const units = in + i;
@@ -138,8 +162,6 @@ std::size_t encode_sse2(const std::uint16_t* in, std::size_t n, std::uint8_t* ou
 
 // ---- AVX2: 32 bytes or 32 units a block ----
 
-#define ZUL_AVX2 __attribute__((target("avx2,bmi,bmi2")))
-
 ZUL_AVX2 std::size_t decode_avx2(const std::uint8_t* in, std::size_t n, std::uint16_t* out,
                                  const std::uint16_t* c1) noexcept {
   std::size_t i = 0;
@@ -159,13 +181,31 @@ ZUL_AVX2 std::size_t decode_avx2(const std::uint8_t* in, std::size_t n, std::uin
   return i;
 }
 
+// A block is first tested whole: packus turns a unit from 0x100 up into 00
+// or FF, never into 80..9F, so the C1 units are the narrowed bytes whose top
+// three bits are 100 (where the set keeps 80..9F the compare looks for 01
+// there, which never matches), and the units from 0x100 up show in the high
+// bytes of both registers at once. A block that fails the test and has one
+// such unit (typical text: a sign or a quotation mark now and then) is done
+// without a further branch on its lane: ISO 8859-1 drops the unit by
+// blending in the block moved down one byte from its lane on; Windows-1252
+// writes the unit's byte over its lane. Blocks with more, or whose one unit
+// Windows-1252 drops, take finish_block.
 ZUL_AVX2 std::size_t encode_avx2(const std::uint16_t* in, std::size_t n, std::uint8_t* out,
                                  const single_byte_charset& set, std::size_t* written) noexcept {
   const bool c1_identity = set.low(0x80) == 0x80;
+  const bool drops_all = c1_identity && set.hash_multiplier == 0;
   const __m256i zero = _mm256_setzero_si256();
   const __m256i high = _mm256_set1_epi16(static_cast<short>(0xFF00));
-  const __m256i c1_bits = _mm256_set1_epi16(static_cast<short>(0xFFE0));
-  const __m256i c1_value = _mm256_set1_epi16(0x0080);
+  const __m256i top3 = _mm256_set1_epi8(static_cast<char>(0xE0));
+  const __m256i c1_value = _mm256_set1_epi8(static_cast<char>(c1_identity ? 0x01 : 0x80));
+  // 32 zero bytes, then 32 bytes FF: read from 32 - k, lane j is FF from j = k on.
+  alignas(64) static constexpr std::uint8_t kFrom[64] = {
+      0,    0,    0,    0,    0,    0,    0,    0,    0,    0,    0,    0,    0,
+      0,    0,    0,    0,    0,    0,    0,    0,    0,    0,    0,    0,    0,
+      0,    0,    0,    0,    0,    0,    0xFF, 0xFF, 0xFF, 0xFF, 0xFF, 0xFF, 0xFF,
+      0xFF, 0xFF, 0xFF, 0xFF, 0xFF, 0xFF, 0xFF, 0xFF, 0xFF, 0xFF, 0xFF, 0xFF, 0xFF,
+      0xFF, 0xFF, 0xFF, 0xFF, 0xFF, 0xFF, 0xFF, 0xFF, 0xFF, 0xFF, 0xFF, 0xFF};
   std::size_t i = 0, o = 0;
   while (i + 32 <= n) {
     const __m256i a = _mm256_loadu_si256(reinterpret_cast<const __m256i*>(in + i));
@@ -173,21 +213,42 @@ ZUL_AVX2 std::size_t encode_avx2(const std::uint16_t* in, std::size_t n, std::ui
     // packus works within 128-bit lanes; the permute puts the quarters back
     // in order (a0 b0 a1 b1 -> a0 a1 b0 b1).
     const __m256i packed = _mm256_permute4x64_epi64(_mm256_packus_epi16(a, b), 0xD8);
-    _mm256_storeu_si256(reinterpret_cast<__m256i*>(out + o), packed);
-    const __m256i high_a = _mm256_cmpeq_epi16(_mm256_and_si256(a, high), zero);
-    const __m256i high_b = _mm256_cmpeq_epi16(_mm256_and_si256(b, high), zero);
-    const auto plain = static_cast<std::uint32_t>(
-        _mm256_movemask_epi8(_mm256_permute4x64_epi64(_mm256_packs_epi16(high_a, high_b), 0xD8)));
-    const auto c1_mask = static_cast<std::uint32_t>(_mm256_movemask_epi8(_mm256_permute4x64_epi64(
-        _mm256_packs_epi16(_mm256_cmpeq_epi16(_mm256_and_si256(a, c1_bits), c1_value),
-                           _mm256_cmpeq_epi16(_mm256_and_si256(b, c1_bits), c1_value)),
-        0xD8)));
-    const unsigned m = exception_bits(~plain, c1_mask, c1_identity);
-    if (m == 0) {
+    const __m256i c1 = _mm256_cmpeq_epi8(_mm256_and_si256(packed, top3), c1_value);
+    const __m256i any = _mm256_or_si256(_mm256_and_si256(_mm256_or_si256(a, b), high), c1);
+    if (_mm256_testz_si256(any, any)) {
+      _mm256_storeu_si256(reinterpret_cast<__m256i*>(out + o), packed);
       i += 32;
       o += 32;
       continue;
     }
+    const __m256i highs = _mm256_permute4x64_epi64(
+        _mm256_packus_epi16(_mm256_srli_epi16(a, 8), _mm256_srli_epi16(b, 8)), 0xD8);
+    const unsigned m =
+        ~static_cast<std::uint32_t>(_mm256_movemask_epi8(_mm256_cmpeq_epi8(highs, zero))) |
+        static_cast<std::uint32_t>(_mm256_movemask_epi8(c1));
+    const unsigned k = _tzcnt_u32(m);  // m is not 0: the block failed the test
+    if (drops_all) {
+      if ((m & (m - 1)) == 0) {
+        const __m256i next =
+            _mm256_alignr_epi8(_mm256_permute2x128_si256(packed, packed, 0x81), packed, 1);
+        const __m256i from_k = _mm256_loadu_si256(reinterpret_cast<const __m256i*>(kFrom + 32 - k));
+        _mm256_storeu_si256(reinterpret_cast<__m256i*>(out + o),
+                            _mm256_blendv_epi8(packed, next, from_k));
+        i += 32;
+        o += 31;
+        continue;
+      }
+    } else if ((m & (m - 1)) == 0) {
+      _mm256_storeu_si256(reinterpret_cast<__m256i*>(out + o), packed);
+      const int byte = byte_for_unit(set, in[i + k]);
+      if (byte >= 0) {
+        out[o + k] = static_cast<std::uint8_t>(byte);
+        i += 32;
+        o += 32;
+        continue;
+      }
+    }
+    _mm256_storeu_si256(reinterpret_cast<__m256i*>(out + o), packed);
     finish_block(in, out, m, 32, set, !c1_identity, i, o);
   }
   *written = o;
@@ -195,8 +256,6 @@ ZUL_AVX2 std::size_t encode_avx2(const std::uint16_t* in, std::size_t n, std::ui
 }
 
 // ---- AVX-512: 64 bytes or 32 units a block ----
-
-#define ZUL_AVX512 __attribute__((target("avx512f,avx512bw,avx512vl,avx512dq,avx2,bmi,bmi2")))
 
 ZUL_AVX512 std::size_t decode_avx512(const std::uint8_t* in, std::size_t n, std::uint16_t* out,
                                      const std::uint16_t* c1) noexcept {
