@@ -19,10 +19,7 @@
 #if defined(__x86_64__) || defined(_M_X64)
 #include <immintrin.h>
 
-#define ZUL_AVX512_VBMI2                                                    \
-  __attribute__((                                                           \
-      target("avx2,bmi,bmi2,avx512f,avx512bw,avx512vl,avx512dq,avx512vbmi," \
-             "avx512vbmi2,popcnt")))
+#include "common/targets.h"
 
 namespace zul::text::detail {
 namespace {
