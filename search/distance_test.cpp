@@ -145,6 +145,9 @@ TEST(jaro_winkler_distance, edge_shapes_match_reference) {
       {{'x'}, text(1000, 'x'), "b far longer"},
       {text(200, 'a'), text(200, 'b'), "nothing in common"},
       {{0xFFFFFFFF, 0}, {0, 0xFFFFFFFF}, "extreme code units"},
+      {{0, 'a', 0, 0, 'b'}, {'b', 0}, "NUL against a short b: its empty lanes hold 0"},
+      {{0x4E00, 0x4E00, 0x4E01}, {0x4E01}, "low byte 0 against the empty lanes of b"},
+      {text(128, 'x'), {'x'}, "window 63: the whole word in reach of the first"},
   };
   for (const auto& row : rows) {
     SCOPED_TRACE(row.why);

@@ -1,13 +1,14 @@
 // Jaro-Winkler matching for a b of at most 64 characters with AVX-512 (F,
-// BW). b sits in registers, in the narrowest lanes that hold every
-// character of b and of the reach of a (bytes, 16 or 32 bits), so the mask
-// of b's positions that hold a character is one compare of b with that
-// character broadcast: no table to build or clear, whatever the code
-// points. What stays serial is the taken mask: per character of a, AND-NOT,
-// lowest set bit, OR; a reach of up to 64 characters takes two characters
-// per read of it. Matched pairs are counted by compressing the matched
-// characters of both texts to the front and comparing them (VBMI2 bytes or
-// 16-bit lanes, else 32-bit lanes), or by a plain walk when there are few.
+// BW). b sits in registers, in the narrowest lanes that tell every
+// character of b and of the reach of a apart (bytes, 16 or 32 bits), so the
+// mask of b's positions that hold a character is one compare of b with that
+// character broadcast, under the window as a mask register: no table to
+// build or clear, whatever the code points. What stays serial is the taken
+// mask: per character of a, AND-NOT, lowest set bit, OR; a reach of up to
+// 64 characters takes two characters per read of it and keeps whether each
+// matched in a register as it goes. Matched pairs are counted by
+// compressing the matched characters of both texts to the front and
+// comparing them (VBMI2 bytes or 16-bit lanes), or by a plain walk.
 #include "search/jaro_kernels.h"
 
 // The zero-masked forms of the conversions and inserts are used throughout:
@@ -23,76 +24,61 @@ namespace zul::search::detail {
 namespace {
 
 // Up to this many matches a plain walk over the taken bits is quicker than
-// loading the matched characters of a back into vectors, which waits for
-// their stores.
+// compressing both texts' matched characters in vectors.
 constexpr long long kScalarPairs = 16;
-
-// A reach of a up to this long is matched one character at a time.
-constexpr std::size_t kShortestPairs = 16;
 
 ZUL_AVX512 inline __mmask16 first_lanes(std::size_t n) {
   return n >= 16 ? static_cast<__mmask16>(0xFFFF) : static_cast<__mmask16>((1u << n) - 1);
 }
 
-// The lowest and highest code units of two texts, not both empty.
-ZUL_AVX512 void fold_range(const std::uint32_t* p, std::size_t n, __m512i& low, __m512i& high) {
+// The bits of x ^ first, ORed into acc, for the code units of one text.
+ZUL_AVX512 void fold_differences(const std::uint32_t* p, std::size_t n, const __m512i& first,
+                                 __m512i& acc) {
   std::size_t i = 0;
   for (; i + 16 <= n; i += 16) {
-    const __m512i v = _mm512_loadu_si512(p + i);
-    low = _mm512_maskz_min_epu32(0xFFFF, low, v);
-    high = _mm512_maskz_max_epu32(0xFFFF, high, v);
+    acc = _mm512_ternarylogic_epi32(acc, _mm512_loadu_si512(p + i), first,
+                                    0xF6);  // acc | (x ^ first)
   }
-  const __mmask16 live = first_lanes(n - i);
-  low = _mm512_mask_min_epu32(low, live, low, _mm512_maskz_loadu_epi32(live, p + i));
-  high = _mm512_mask_max_epu32(high, live, high, _mm512_maskz_loadu_epi32(live, p + i));
+  const __m512i tail = _mm512_mask_loadu_epi32(first, first_lanes(n - i), p + i);
+  acc = _mm512_ternarylogic_epi32(acc, tail, first, 0xF6);
 }
 
-ZUL_AVX512 void fold_lanes(__m512i& low, __m512i& high, const __m512i& other_low,
-                           const __m512i& other_high) {
-  low = _mm512_maskz_min_epu32(0xFFFF, low, other_low);
-  high = _mm512_maskz_max_epu32(0xFFFF, high, other_high);
+// The lane width for two texts (b not empty): 8 bits when all their code
+// units agree above the low byte, 16 when they agree above the low 16 bits,
+// else 32. Within those lanes, equal lanes are equal code points.
+ZUL_AVX512 int lane_bits_of(std::span<const std::uint32_t> a, std::span<const std::uint32_t> b) {
+  const __m512i first = _mm512_set1_epi32(static_cast<int>(b[0]));
+  __m512i acc = _mm512_setzero_si512();
+  fold_differences(a.data(), a.size(), first, acc);
+  fold_differences(b.data(), b.size(), first, acc);
+  if (_mm512_test_epi32_mask(acc, _mm512_set1_epi32(~0xFF)) == 0) return 8;
+  if (_mm512_test_epi32_mask(acc, _mm512_set1_epi32(~0xFFFF)) == 0) return 16;
+  return 32;
 }
 
-ZUL_AVX512 lane_choice choose_lanes_of(std::span<const std::uint32_t> a,
-                                       std::span<const std::uint32_t> b) {
-  __m512i low = _mm512_set1_epi32(-1);
-  __m512i high = _mm512_setzero_si512();
-  fold_range(a.data(), a.size(), low, high);
-  fold_range(b.data(), b.size(), low, high);
-  // Halve the lanes four times: 128-bit quarters, 64-bit halves, 32 bits.
-  // (The shuffles take immediates, so the steps are written out.)
-  fold_lanes(low, high, _mm512_maskz_shuffle_i64x2(0xFF, low, low, 0x4E),
-             _mm512_maskz_shuffle_i64x2(0xFF, high, high, 0x4E));
-  fold_lanes(low, high, _mm512_maskz_shuffle_i64x2(0xFF, low, low, 0xB1),
-             _mm512_maskz_shuffle_i64x2(0xFF, high, high, 0xB1));
-  fold_lanes(low, high, _mm512_maskz_shuffle_epi32(0xFFFF, low, _MM_PERM_BADC),
-             _mm512_maskz_shuffle_epi32(0xFFFF, high, _MM_PERM_BADC));
-  fold_lanes(low, high, _mm512_maskz_shuffle_epi32(0xFFFF, low, _MM_PERM_CDAB),
-             _mm512_maskz_shuffle_epi32(0xFFFF, high, _MM_PERM_CDAB));
-  return choose_lanes(
-      static_cast<std::uint32_t>(_mm_cvtsi128_si32(_mm512_maskz_extracti32x4_epi32(0xF, low, 0))),
-      static_cast<std::uint32_t>(_mm_cvtsi128_si32(_mm512_maskz_extracti32x4_epi32(0xF, high, 0))));
-}
-
-// b in 32-bit lanes, 16 per register; lanes at and beyond lb hold the pad.
+// b in 32-bit lanes, 16 per register; lanes at and beyond lb hold 0, and
+// the compares leave them out (live).
 struct b_lanes {
   __m512i v[4];
+  std::uint64_t live;
 };
 
-// Up to 64 characters in 32-bit lanes, the pad past their end.
-ZUL_AVX512 b_lanes load_lanes(std::span<const std::uint32_t> text, __m512i pad) {
+// Up to 64 characters in 32-bit lanes.
+ZUL_AVX512 b_lanes load_lanes(std::span<const std::uint32_t> text) {
   b_lanes w;
   for (std::size_t k = 0; k < 4; ++k) {
     const std::size_t from = std::min(16 * k, text.size());
-    w.v[k] = _mm512_mask_loadu_epi32(pad, first_lanes(text.size() - from), text.data() + from);
+    w.v[k] = _mm512_maskz_loadu_epi32(first_lanes(text.size() - from), text.data() + from);
   }
+  w.live = _bzhi_u64(~std::uint64_t{0}, static_cast<unsigned>(text.size()));
   return w;
 }
 
 // Position masks with b in byte lanes: one register, one compare.
 struct lanes8 {
   __m512i b;
-  ZUL_AVX512 explicit lanes8(const b_lanes& w) {
+  __mmask64 live;
+  ZUL_AVX512 explicit lanes8(const b_lanes& w) : live(_cvtu64_mask64(w.live)) {
     const __m512i lo = _mm512_maskz_inserti32x4(
         0xFFFF,
         _mm512_maskz_inserti32x4(0xFFFF, _mm512_setzero_si512(),
@@ -102,15 +88,18 @@ struct lanes8 {
         _mm512_maskz_inserti32x4(0xFFFF, lo, _mm512_maskz_cvtepi32_epi8(0xFFFF, w.v[2]), 2);
     b = _mm512_maskz_inserti32x4(0xFFFF, hi, _mm512_maskz_cvtepi32_epi8(0xFFFF, w.v[3]), 3);
   }
-  ZUL_AVX512 std::uint64_t operator()(std::uint32_t c) const {
-    return _mm512_cmpeq_epi8_mask(b, _mm512_set1_epi8(static_cast<char>(c)));
+  // The positions of c in b among those of m.
+  ZUL_AVX512 std::uint64_t within(std::uint32_t c, __mmask64 m) const {
+    return _mm512_mask_cmpeq_epi8_mask(m, b, _mm512_set1_epi8(static_cast<char>(c)));
   }
+  ZUL_AVX512 std::uint64_t operator()(std::uint32_t c) const { return within(c, live); }
 };
 
 // 16-bit lanes: two registers of 32.
 struct lanes16 {
   __m512i b[2];
-  ZUL_AVX512 explicit lanes16(const b_lanes& w) {
+  __mmask64 live;
+  ZUL_AVX512 explicit lanes16(const b_lanes& w) : live(_cvtu64_mask64(w.live)) {
     for (int h = 0; h < 2; ++h) {
       b[h] = _mm512_maskz_inserti64x4(
           0xFF,
@@ -119,25 +108,32 @@ struct lanes16 {
           _mm512_maskz_cvtepi32_epi16(0xFFFF, w.v[2 * h + 1]), 1);
     }
   }
-  ZUL_AVX512 std::uint64_t operator()(std::uint32_t c) const {
+  ZUL_AVX512 std::uint64_t within(std::uint32_t c, __mmask64 m) const {
     const __m512i x = _mm512_set1_epi16(static_cast<short>(c));
+    const auto high = static_cast<__mmask32>(_kshiftri_mask64(m, 32));
     return _cvtmask64_u64(
-        _mm512_kunpackd(_mm512_cmpeq_epi16_mask(b[1], x), _mm512_cmpeq_epi16_mask(b[0], x)));
+        _mm512_kunpackd(_mm512_mask_cmpeq_epi16_mask(high, b[1], x),
+                        _mm512_mask_cmpeq_epi16_mask(static_cast<__mmask32>(m), b[0], x)));
   }
+  ZUL_AVX512 std::uint64_t operator()(std::uint32_t c) const { return within(c, live); }
 };
 
 // Whole code points: four registers of 16.
 struct lanes32 {
   const b_lanes& w;
-  ZUL_AVX512 explicit lanes32(const b_lanes& lanes) : w(lanes) {}
-  ZUL_AVX512 std::uint64_t operator()(std::uint32_t c) const {
+  __mmask64 live;
+  ZUL_AVX512 explicit lanes32(const b_lanes& lanes) : w(lanes), live(_cvtu64_mask64(lanes.live)) {}
+  ZUL_AVX512 std::uint64_t within(std::uint32_t c, __mmask64 m) const {
     const __m512i x = _mm512_set1_epi32(static_cast<int>(c));
-    std::uint64_t m = 0;
+    const std::uint64_t bits = _cvtmask64_u64(m);
+    std::uint64_t found = 0;
     for (int k = 0; k < 4; ++k) {
-      m |= std::uint64_t{_mm512_cmpeq_epi32_mask(w.v[k], x)} << (16 * k);
+      const auto part = static_cast<__mmask16>(bits >> (16 * k));
+      found |= std::uint64_t{_mm512_mask_cmpeq_epi32_mask(part, w.v[k], x)} << (16 * k);
     }
-    return m;
+    return found;
   }
+  ZUL_AVX512 std::uint64_t operator()(std::uint32_t c) const { return within(c, live); }
 };
 
 template <class Positions>
@@ -247,75 +243,84 @@ ZUL_AVX512_VBMI2 std::size_t count_crossed_words(const __m512i (&a)[2], std::uin
   return static_cast<std::size_t>(_mm_popcnt_u64(differ));
 }
 
-// The value as computed, in a register: the compiler may not re-associate
-// the ANDs around it. Left alone, it moves the taken mask to the front of
-// each chain of ANDs, which lengthens the serial path through it.
-ZUL_AVX512 inline std::uint64_t settled(std::uint64_t x) {
-  asm("" : "+r"(x));
-  return x;
+// One greedy step: the lowest open position not yet in t is taken, and
+// whether there was one enters f at the top (BLSI sets the carry when its
+// source is not zero; RCR shifts it in). Written out in assembly so that
+// nothing comes between the two: a flag kept this way costs one operation
+// beside the serial chain, where storing the picks and reading them back
+// made the last of them wait for their stores.
+ZUL_AVX512 inline void pick_one(std::uint64_t& t, std::uint64_t& f, std::uint64_t open) {
+  std::uint64_t p;
+  asm("andn %[o], %[t], %[p]\n\t"
+      "blsi %[p], %[p]\n\t"
+      "rcr $1, %[f]\n\t"
+      "or %[p], %[t]"
+      : [t] "+r"(t), [f] "+r"(f), [p] "=&r"(p)
+      : [o] "r"(open)
+      : "cc");
 }
 
-// Picks for two characters in a row, both from the same taken mask t: the
-// second cannot take the first one's pick, which only an equal character
-// can hold, so it removes that pick and nothing else. Two characters cost
-// five dependent steps instead of six.
-ZUL_AVX512 inline std::uint64_t pick_two(std::uint64_t t, std::uint64_t open0, std::uint64_t open1,
-                                         std::uint64_t* picks) {
-  // A second copy of t keeps the two ANDNs apart (not one NOT and two ANDs).
-  const std::uint64_t p0 = _blsi_u64(_andn_u64(t, open0));
-  const std::uint64_t p1 = _blsi_u64(_andn_u64(p0, settled(_andn_u64(settled(t), open1))));
-  picks[0] = p0;
-  picks[1] = p1;
-  return settled(t | p0) | p1;
+// Two steps in a row, both from the same taken mask t: the second cannot
+// take the first one's pick, which only an equal character can hold, so it
+// removes that pick and nothing else. Two characters cost five dependent
+// steps instead of six.
+ZUL_AVX512 inline void pick_two(std::uint64_t& t, std::uint64_t& f, std::uint64_t open0,
+                                std::uint64_t open1) {
+  std::uint64_t p0, p1;
+  asm("andn %[o1], %[t], %[p1]\n\t"
+      "andn %[o0], %[t], %[p0]\n\t"
+      "blsi %[p0], %[p0]\n\t"
+      "rcr $1, %[f]\n\t"
+      "andn %[p1], %[p0], %[p1]\n\t"
+      "or %[p0], %[t]\n\t"
+      "blsi %[p1], %[p1]\n\t"
+      "rcr $1, %[f]\n\t"
+      "or %[p1], %[t]"
+      : [t] "+r"(t), [f] "+r"(f), [p0] "=&r"(p0), [p1] "=&r"(p1)
+      : [o0] "r"(open0), [o1] "r"(open1)
+      : "cc");
 }
 
-// Matching for a reach of at most 64 characters. Each character's mask is
-// found in registers and the taken mask stays in a register; the loop is
-// split where the window stops growing at its lower end, so the window
-// costs one add per character. The picks are stored and read back once, as
-// vectors, for the mask of matched characters of a: cheaper than building
-// it bit by bit in the serial loop.
+// Matching for a reach of at most 64 characters, returning the mask of its
+// matched characters. Each character's mask is found in registers and the
+// taken mask stays in a register. The window is a mask register that the
+// compares apply for free: it shifts up one per character, and while it
+// still grows at its lower end it also gains bit 0 (the loop is split
+// there). Positions past the end of b start out taken, so the window needs
+// no cut at lb. Whether each character took a position enters f from the
+// top (see pick_one).
 template <class Positions>
 ZUL_AVX512 std::uint64_t match_short(const Positions& positions,
                                      std::span<const std::uint32_t> reach, std::size_t window,
                                      std::uint64_t& taken) {
-  alignas(64) std::uint64_t picks[64];
-  std::uint64_t bound = window >= 63 ? ~std::uint64_t{0} : (std::uint64_t{2} << window) - 1;
+  const std::uint64_t first = window >= 63 ? ~std::uint64_t{0} : (std::uint64_t{2} << window) - 1;
+  __mmask64 bound = _cvtu64_mask64(first);
+  const __mmask64 one = _cvtu64_mask64(1);
   const std::size_t n = reach.size();
   const std::size_t growing = std::min(window, n);
-  std::uint64_t t = 0;
+  std::uint64_t t = ~_cvtmask64_u64(positions.live);
+  std::uint64_t f = 0;
   std::size_t i = 0;
   for (; i + 2 <= growing; i += 2) {
-    const std::uint64_t open0 = settled(positions(reach[i]) & bound);
-    const std::uint64_t open1 = settled(positions(reach[i + 1]) & (bound * 2 + 1));
-    t = pick_two(t, open0, open1, picks + i);
-    bound = bound * 4 + 3;
+    const __mmask64 next = _kor_mask64(_kshiftli_mask64(bound, 1), one);
+    pick_two(t, f, positions.within(reach[i], bound), positions.within(reach[i + 1], next));
+    bound = _kor_mask64(_kshiftli_mask64(next, 1), one);
   }
   for (; i < growing; ++i) {
-    picks[i] = _blsi_u64(_andn_u64(t, settled(positions(reach[i]) & bound)));
-    t |= picks[i];
-    bound = bound * 2 + 1;
+    pick_one(t, f, positions.within(reach[i], bound));
+    bound = _kor_mask64(_kshiftli_mask64(bound, 1), one);
   }
   for (; i + 2 <= n; i += 2) {
-    const std::uint64_t open0 = settled(positions(reach[i]) & bound);
-    const std::uint64_t open1 = settled(positions(reach[i + 1]) & (bound * 2));
-    t = pick_two(t, open0, open1, picks + i);
-    bound *= 4;
+    pick_two(t, f, positions.within(reach[i], bound),
+             positions.within(reach[i + 1], _kshiftli_mask64(bound, 1)));
+    bound = _kshiftli_mask64(bound, 2);
   }
   for (; i < n; ++i) {
-    picks[i] = _blsi_u64(_andn_u64(t, settled(positions(reach[i]) & bound)));
-    t |= picks[i];
-    bound *= 2;
+    pick_one(t, f, positions.within(reach[i], bound));
+    bound = _kshiftli_mask64(bound, 1);
   }
-  std::uint64_t matched_a = 0;
-  for (std::size_t k = 0; 8 * k < n; ++k) {
-    const std::size_t left = n - 8 * k;
-    const auto live = static_cast<__mmask8>(left >= 8 ? 0xFF : (1u << left) - 1);
-    const __m512i v = _mm512_maskz_loadu_epi64(live, picks + 8 * k);
-    matched_a |= std::uint64_t{_mm512_test_epi64_mask(v, v)} << (8 * k);
-  }
-  taken = t;
-  return matched_a;
+  taken = t & _cvtmask64_u64(positions.live);
+  return f >> (64 - n);  // the first character's flag lowest (n is 1 to 64)
 }
 
 }  // namespace
@@ -323,39 +328,35 @@ ZUL_AVX512 std::uint64_t match_short(const Positions& positions,
 ZUL_AVX512 jaro_counts match_word_avx512(std::span<const std::uint32_t> reach,
                                          std::span<const std::uint32_t> b,
                                          std::size_t window) noexcept {
-  // Lanes past the end of b hold a pad that equals no character of a or b,
-  // so masks need no cut at lb. Characters are compared by their low 8, 16
-  // or 32 bits, the fewest that tell them apart (see choose_lanes).
-  const lane_choice choice = choose_lanes_of(reach, b);
-  if (choice.bits == 0) return match_word_scalar(reach, b, window);
-  const __m512i pad = _mm512_set1_epi32(static_cast<int>(choice.pad));
-  const b_lanes w = load_lanes(b, pad);
+  // Characters are compared by their low 8, 16 or 32 bits, the fewest that
+  // tell them apart. The choice only steers branches: the lanes of b do not
+  // wait for it.
+  const int bits = lane_bits_of(reach, b);
+  const b_lanes w = load_lanes(b);
   // Up to 16 characters of a, reading the picks back costs more than the
   // pairs save; beyond 64 they do not fit one mask.
-  if (reach.size() > 64 || reach.size() <= kShortestPairs) {
-    if (choice.bits == 8) return match_with(lanes8(w), w, reach, b, window);
-    if (choice.bits == 16) return match_with(lanes16(w), w, reach, b, window);
+  if (reach.size() > 64) {
+    if (bits == 8) return match_with(lanes8(w), w, reach, b, window);
+    if (bits == 16) return match_with(lanes16(w), w, reach, b, window);
     return match_with(lanes32(w), w, reach, b, window);
   }
   // The matched characters of a and the taken positions of b, then the
   // pairs among them that differ.
   jaro_counts counts;
   std::uint64_t taken = 0;
-  if (choice.bits == 8) {
+  if (bits == 8) {
     const lanes8 in_b(w);
     const std::uint64_t matched_a = match_short(in_b, reach, window, taken);
     if (_mm_popcnt_u64(taken) > kScalarPairs && simd::has_avx512_vbmi2()) {
-      counts.crossed =
-          count_crossed_bytes(lanes8(load_lanes(reach, pad)).b, matched_a, in_b.b, taken);
+      counts.crossed = count_crossed_bytes(lanes8(load_lanes(reach)).b, matched_a, in_b.b, taken);
     } else {
       counts.crossed = count_crossed_walk(reach, matched_a, b, taken);
     }
-  } else if (choice.bits == 16) {
+  } else if (bits == 16) {
     const lanes16 in_b(w);
     const std::uint64_t matched_a = match_short(in_b, reach, window, taken);
     if (_mm_popcnt_u64(taken) > kScalarPairs && simd::has_avx512_vbmi2()) {
-      counts.crossed =
-          count_crossed_words(lanes16(load_lanes(reach, pad)).b, matched_a, in_b.b, taken);
+      counts.crossed = count_crossed_words(lanes16(load_lanes(reach)).b, matched_a, in_b.b, taken);
     } else {
       counts.crossed = count_crossed_walk(reach, matched_a, b, taken);
     }
