@@ -281,43 +281,75 @@ ZUL_AVX512 inline void pick_two(std::uint64_t& t, std::uint64_t& f, std::uint64_
       : "cc");
 }
 
+// The window of a character of a over b: bits max(0, i - window) to
+// i + window. With byte lanes it is a mask register that the compare
+// applies for free; wider lanes take two or four compares, where splitting
+// the mask register for each costs more than an AND in a general register.
+template <class Positions>
+struct sliding_window {
+  std::uint64_t bits;
+  ZUL_AVX512 std::uint64_t open(const Positions& positions, std::uint32_t c) const {
+    return positions(c) & bits;
+  }
+  template <int k>
+  ZUL_AVX512 sliding_window slid() const {
+    return {bits << k};
+  }
+  ZUL_AVX512 sliding_window grown() const { return {bits * 2 + 1}; }
+};
+
+template <>
+struct sliding_window<lanes8> {
+  __mmask64 bits;
+  ZUL_AVX512 explicit sliding_window(std::uint64_t first) : bits(_cvtu64_mask64(first)) {}
+  ZUL_AVX512 explicit sliding_window(__mmask64 m, int) : bits(m) {}
+  ZUL_AVX512 std::uint64_t open(const lanes8& positions, std::uint32_t c) const {
+    return positions.within(c, bits);
+  }
+  template <int k>
+  ZUL_AVX512 sliding_window slid() const {
+    return sliding_window(_kshiftli_mask64(bits, k), 0);
+  }
+  ZUL_AVX512 sliding_window grown() const {
+    return sliding_window(_kor_mask64(_kshiftli_mask64(bits, 1), _cvtu64_mask64(1)), 0);
+  }
+};
+
 // Matching for a reach of at most 64 characters, returning the mask of its
 // matched characters. Each character's mask is found in registers and the
-// taken mask stays in a register. The window is a mask register that the
-// compares apply for free: it shifts up one per character, and while it
-// still grows at its lower end it also gains bit 0 (the loop is split
-// there). Positions past the end of b start out taken, so the window needs
-// no cut at lb. Whether each character took a position enters f from the
-// top (see pick_one).
+// taken mask stays in a register. The window shifts up one per character,
+// and while it still grows at its lower end it also gains bit 0 (the loop
+// is split there). Positions past the end of b start out taken, so the
+// window needs no cut at lb. Whether each character took a position enters
+// f from the top (see pick_one).
 template <class Positions>
 ZUL_AVX512 std::uint64_t match_short(const Positions& positions,
                                      std::span<const std::uint32_t> reach, std::size_t window,
                                      std::uint64_t& taken) {
-  const std::uint64_t first = window >= 63 ? ~std::uint64_t{0} : (std::uint64_t{2} << window) - 1;
-  __mmask64 bound = _cvtu64_mask64(first);
-  const __mmask64 one = _cvtu64_mask64(1);
+  using window_t = sliding_window<Positions>;
+  window_t bound{window >= 63 ? ~std::uint64_t{0} : (std::uint64_t{2} << window) - 1};
   const std::size_t n = reach.size();
   const std::size_t growing = std::min(window, n);
   std::uint64_t t = ~_cvtmask64_u64(positions.live);
   std::uint64_t f = 0;
   std::size_t i = 0;
   for (; i + 2 <= growing; i += 2) {
-    const __mmask64 next = _kor_mask64(_kshiftli_mask64(bound, 1), one);
-    pick_two(t, f, positions.within(reach[i], bound), positions.within(reach[i + 1], next));
-    bound = _kor_mask64(_kshiftli_mask64(next, 1), one);
+    const window_t next = bound.grown();
+    pick_two(t, f, bound.open(positions, reach[i]), next.open(positions, reach[i + 1]));
+    bound = next.grown();
   }
   for (; i < growing; ++i) {
-    pick_one(t, f, positions.within(reach[i], bound));
-    bound = _kor_mask64(_kshiftli_mask64(bound, 1), one);
+    pick_one(t, f, bound.open(positions, reach[i]));
+    bound = bound.grown();
   }
   for (; i + 2 <= n; i += 2) {
-    pick_two(t, f, positions.within(reach[i], bound),
-             positions.within(reach[i + 1], _kshiftli_mask64(bound, 1)));
-    bound = _kshiftli_mask64(bound, 2);
+    pick_two(t, f, bound.open(positions, reach[i]),
+             bound.template slid<1>().open(positions, reach[i + 1]));
+    bound = bound.template slid<2>();
   }
   for (; i < n; ++i) {
-    pick_one(t, f, positions.within(reach[i], bound));
-    bound = _kshiftli_mask64(bound, 1);
+    pick_one(t, f, bound.open(positions, reach[i]));
+    bound = bound.template slid<1>();
   }
   taken = t & _cvtmask64_u64(positions.live);
   return f >> (64 - n);  // the first character's flag lowest (n is 1 to 64)
@@ -333,8 +365,7 @@ ZUL_AVX512 jaro_counts match_word_avx512(std::span<const std::uint32_t> reach,
   // wait for it.
   const int bits = lane_bits_of(reach, b);
   const b_lanes w = load_lanes(b);
-  // Up to 16 characters of a, reading the picks back costs more than the
-  // pairs save; beyond 64 they do not fit one mask.
+  // A reach beyond 64 characters does not fit one mask.
   if (reach.size() > 64) {
     if (bits == 8) return match_with(lanes8(w), w, reach, b, window);
     if (bits == 16) return match_with(lanes16(w), w, reach, b, window);
