@@ -2,8 +2,8 @@
 // BW). b sits in registers, in the narrowest lanes that tell every
 // character of b and of the reach of a apart (bytes, 16 or 32 bits), so the
 // mask of b's positions that hold a character is one compare of b with that
-// character broadcast, under the window as a mask register: no table to
-// build or clear, whatever the code points. What stays serial is the taken
+// character broadcast, under the window (a mask register with byte lanes):
+// no table to build or clear, whatever the code points. What stays serial is the taken
 // mask: per character of a, AND-NOT, lowest set bit, OR; a reach of up to
 // 64 characters takes two characters per read of it and keeps whether each
 // matched in a register as it goes. Matched pairs are counted by
