@@ -29,24 +29,6 @@ struct jaro_kernels {
                             std::size_t window) noexcept;
 };
 
-// Lanes for the vector kernels: the narrowest width (8, 16 or 32 bits) in
-// which the code units from low to high (those of b and of the reach of a)
-// keep distinct low bits, and the pad for the lanes past the end of b. Any
-// 2^bits - 1 consecutive values have distinct low bits and leave out those
-// of low - 1, which is then the pad: it equals none of them. bits is 0 when
-// the code units span every 32-bit value.
-struct lane_choice {
-  int bits = 8;
-  std::uint32_t pad = 0;
-};
-constexpr lane_choice choose_lanes(std::uint32_t low, std::uint32_t high) noexcept {
-  const std::uint32_t span = high - low;
-  lane_choice c;
-  c.bits = span < 0xFFu ? 8 : span < 0xFFFFu ? 16 : span < 0xFFFFFFFFu ? 32 : 0;
-  c.pad = low - 1;
-  return c;
-}
-
 const simd::family_tables<jaro_kernels>& jaro_tables() noexcept;
 const jaro_kernels& active_jaro_kernels() noexcept;
 

@@ -19,6 +19,7 @@
 #include <algorithm>
 
 #include "common/targets.h"
+#include "search/jaro_steps.h"
 
 namespace zul::search::detail {
 namespace {
@@ -182,18 +183,6 @@ ZUL_AVX512 jaro_counts match_with(const Positions& positions, const b_lanes& w,
   return counts;
 }
 
-// The matched pairs that differ, by a walk over both match masks: the
-// characters of a at the set bits of matched_a against those of b at the
-// set bits of taken, rank by rank (both masks have the same count).
-ZUL_AVX512 std::size_t count_crossed_walk(std::span<const std::uint32_t> a, std::uint64_t matched_a,
-                                          std::span<const std::uint32_t> b, std::uint64_t taken) {
-  std::size_t crossed = 0;
-  for (; taken != 0; taken = _blsr_u64(taken), matched_a = _blsr_u64(matched_a)) {
-    crossed += a[_tzcnt_u64(matched_a)] != b[_tzcnt_u64(taken)] ? 1 : 0;
-  }
-  return crossed;
-}
-
 // The same count with VBMI2 and the characters of both texts in byte lanes:
 // both sides compressed to the front of one register each. Vectors come by
 // reference: a function that takes them by value returns with the upper
@@ -241,44 +230,6 @@ ZUL_AVX512_VBMI2 std::size_t count_crossed_words(const __m512i (&a)[2], std::uin
                                    static_cast<__mmask32>(live >> 32), from_a[1], from_b[1])}
                                    << 32;
   return static_cast<std::size_t>(_mm_popcnt_u64(differ));
-}
-
-// One greedy step: the lowest open position not yet in t is taken, and
-// whether there was one enters f at the top (BLSI sets the carry when its
-// source is not zero; RCR shifts it in). Written out in assembly so that
-// nothing comes between the two: a flag kept this way costs one operation
-// beside the serial chain, where storing the picks and reading them back
-// made the last of them wait for their stores.
-ZUL_AVX512 inline void pick_one(std::uint64_t& t, std::uint64_t& f, std::uint64_t open) {
-  std::uint64_t p;
-  asm("andn %[o], %[t], %[p]\n\t"
-      "blsi %[p], %[p]\n\t"
-      "rcr $1, %[f]\n\t"
-      "or %[p], %[t]"
-      : [t] "+r"(t), [f] "+r"(f), [p] "=&r"(p)
-      : [o] "r"(open)
-      : "cc");
-}
-
-// Two steps in a row, both from the same taken mask t: the second cannot
-// take the first one's pick, which only an equal character can hold, so it
-// removes that pick and nothing else. Two characters cost five dependent
-// steps instead of six.
-ZUL_AVX512 inline void pick_two(std::uint64_t& t, std::uint64_t& f, std::uint64_t open0,
-                                std::uint64_t open1) {
-  std::uint64_t p0, p1;
-  asm("andn %[o1], %[t], %[p1]\n\t"
-      "andn %[o0], %[t], %[p0]\n\t"
-      "blsi %[p0], %[p0]\n\t"
-      "rcr $1, %[f]\n\t"
-      "andn %[p1], %[p0], %[p1]\n\t"
-      "or %[p0], %[t]\n\t"
-      "blsi %[p1], %[p1]\n\t"
-      "rcr $1, %[f]\n\t"
-      "or %[p1], %[t]"
-      : [t] "+r"(t), [f] "+r"(f), [p0] "=&r"(p0), [p1] "=&r"(p1)
-      : [o0] "r"(open0), [o1] "r"(open1)
-      : "cc");
 }
 
 // The window of a character of a over b: bits max(0, i - window) to
