@@ -3,12 +3,13 @@
 // character of b and of the reach of a apart (bytes, 16 or 32 bits), so the
 // mask of b's positions that hold a character is one compare of b with that
 // character broadcast, under the window (a mask register with byte lanes):
-// no table to build or clear, whatever the code points. What stays serial is the taken
-// mask: per character of a, AND-NOT, lowest set bit, OR; a reach of up to
-// 64 characters takes two characters per read of it and keeps whether each
-// matched in a register as it goes. Matched pairs are counted by
-// compressing the matched characters of both texts to the front and
-// comparing them (VBMI2 bytes or 16-bit lanes), or by a plain walk.
+// no table to build or clear, whatever the code points. What stays serial
+// is the taken mask: per character of a, AND-NOT, lowest set bit, OR; a
+// reach of up to 64 characters takes two characters per read of it and
+// keeps whether each matched in a register as it goes (jaro_steps.h).
+// Matched pairs are counted by compressing the matched characters of both
+// texts to the front and comparing them (VBMI2 bytes or 16-bit lanes), or
+// by a plain walk.
 #include "search/jaro_kernels.h"
 
 // The zero-masked forms of the conversions and inserts are used throughout:
@@ -36,9 +37,9 @@ ZUL_AVX512 inline __mmask16 first_lanes(std::size_t n) {
 ZUL_AVX512 void fold_differences(const std::uint32_t* p, std::size_t n, const __m512i& first,
                                  __m512i& acc) {
   std::size_t i = 0;
+  // 0xF6: acc | (x ^ first).
   for (; i + 16 <= n; i += 16) {
-    acc = _mm512_ternarylogic_epi32(acc, _mm512_loadu_si512(p + i), first,
-                                    0xF6);  // acc | (x ^ first)
+    acc = _mm512_ternarylogic_epi32(acc, _mm512_loadu_si512(p + i), first, 0xF6);
   }
   const __m512i tail = _mm512_mask_loadu_epi32(first, first_lanes(n - i), p + i);
   acc = _mm512_ternarylogic_epi32(acc, tail, first, 0xF6);
