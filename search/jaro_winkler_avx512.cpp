@@ -79,8 +79,8 @@ ZUL_AVX512 b_lanes load_lanes(std::span<const std::uint32_t> text) {
 // Position masks with b in byte lanes: one register, one compare.
 struct lanes8 {
   __m512i b;
-  __mmask64 live;
-  ZUL_AVX512 explicit lanes8(const b_lanes& w) : live(_cvtu64_mask64(w.live)) {
+  std::uint64_t live;
+  ZUL_AVX512 explicit lanes8(const b_lanes& w) : live(w.live) {
     const __m512i lo = _mm512_maskz_inserti32x4(
         0xFFFF,
         _mm512_maskz_inserti32x4(0xFFFF, _mm512_setzero_si512(),
@@ -94,14 +94,16 @@ struct lanes8 {
   ZUL_AVX512 std::uint64_t within(std::uint32_t c, __mmask64 m) const {
     return _mm512_mask_cmpeq_epi8_mask(m, b, _mm512_set1_epi8(static_cast<char>(c)));
   }
-  ZUL_AVX512 std::uint64_t operator()(std::uint32_t c) const { return within(c, live); }
+  ZUL_AVX512 std::uint64_t operator()(std::uint32_t c) const {
+    return within(c, _cvtu64_mask64(live));
+  }
 };
 
 // 16-bit lanes: two registers of 32.
 struct lanes16 {
   __m512i b[2];
-  __mmask64 live;
-  ZUL_AVX512 explicit lanes16(const b_lanes& w) : live(_cvtu64_mask64(w.live)) {
+  std::uint64_t live;
+  ZUL_AVX512 explicit lanes16(const b_lanes& w) : live(w.live) {
     for (int h = 0; h < 2; ++h) {
       b[h] = _mm512_maskz_inserti64x4(
           0xFF,
@@ -110,32 +112,29 @@ struct lanes16 {
           _mm512_maskz_cvtepi32_epi16(0xFFFF, w.v[2 * h + 1]), 1);
     }
   }
-  ZUL_AVX512 std::uint64_t within(std::uint32_t c, __mmask64 m) const {
+  ZUL_AVX512 std::uint64_t operator()(std::uint32_t c) const {
     const __m512i x = _mm512_set1_epi16(static_cast<short>(c));
-    const auto high = static_cast<__mmask32>(_kshiftri_mask64(m, 32));
-    return _cvtmask64_u64(
-        _mm512_kunpackd(_mm512_mask_cmpeq_epi16_mask(high, b[1], x),
-                        _mm512_mask_cmpeq_epi16_mask(static_cast<__mmask32>(m), b[0], x)));
+    const auto low_half = static_cast<__mmask32>(live);
+    const auto high_half = static_cast<__mmask32>(live >> 32);
+    return _cvtmask64_u64(_mm512_kunpackd(_mm512_mask_cmpeq_epi16_mask(high_half, b[1], x),
+                                          _mm512_mask_cmpeq_epi16_mask(low_half, b[0], x)));
   }
-  ZUL_AVX512 std::uint64_t operator()(std::uint32_t c) const { return within(c, live); }
 };
 
 // Whole code points: four registers of 16.
 struct lanes32 {
   const b_lanes& w;
-  __mmask64 live;
-  ZUL_AVX512 explicit lanes32(const b_lanes& lanes) : w(lanes), live(_cvtu64_mask64(lanes.live)) {}
-  ZUL_AVX512 std::uint64_t within(std::uint32_t c, __mmask64 m) const {
+  std::uint64_t live;
+  ZUL_AVX512 explicit lanes32(const b_lanes& lanes) : w(lanes), live(lanes.live) {}
+  ZUL_AVX512 std::uint64_t operator()(std::uint32_t c) const {
     const __m512i x = _mm512_set1_epi32(static_cast<int>(c));
-    const std::uint64_t bits = _cvtmask64_u64(m);
     std::uint64_t found = 0;
     for (int k = 0; k < 4; ++k) {
-      const auto part = static_cast<__mmask16>(bits >> (16 * k));
+      const auto part = static_cast<__mmask16>(live >> (16 * k));
       found |= std::uint64_t{_mm512_mask_cmpeq_epi32_mask(part, w.v[k], x)} << (16 * k);
     }
     return found;
   }
-  ZUL_AVX512 std::uint64_t operator()(std::uint32_t c) const { return within(c, live); }
 };
 
 template <class Positions>
@@ -282,7 +281,7 @@ ZUL_AVX512 std::uint64_t match_short(const Positions& positions,
   window_t bound{window >= 63 ? ~std::uint64_t{0} : (std::uint64_t{2} << window) - 1};
   const std::size_t n = reach.size();
   const std::size_t growing = std::min(window, n);
-  std::uint64_t t = ~_cvtmask64_u64(positions.live);
+  std::uint64_t t = ~positions.live;
   std::uint64_t f = 0;
   std::size_t i = 0;
   for (; i + 2 <= growing; i += 2) {
@@ -303,7 +302,7 @@ ZUL_AVX512 std::uint64_t match_short(const Positions& positions,
     pick_one(t, f, bound.open(positions, reach[i]));
     bound = bound.template slid<1>();
   }
-  taken = t & _cvtmask64_u64(positions.live);
+  taken = t & positions.live;
   return f >> (64 - n);  // the first character's flag lowest (n is 1 to 64)
 }
 
